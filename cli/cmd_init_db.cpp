@@ -1,0 +1,40 @@
+#include "cli/commands.h"
+#include "cli/options.h"
+#include "platform/connection.h"
+#include "schema/demo_data.h"
+#include "schema/schema.h"
+#include "settings/login.h"
+#include "settings/settings_location.h"
+
+#include <QDir>
+#include <QFileInfo>
+#include <cstdio>
+
+namespace quotas::cli {
+
+int initDb(const QStringList& args)
+{
+    const Options options(QStringLiteral("init-db"),
+                          {{QStringLiteral("demo"), QStringLiteral("Associados de demonstração."), QStringLiteral("N")}},
+                          args);
+    const int demo = options.isSet(QStringLiteral("demo")) ? options.number(QStringLiteral("demo"), 0, 10000000) : 0;
+    LoginSettings settings;
+    QString missing;
+    if (!readLoginSettings(settings, &missing))
+        throw UsageError(QStringLiteral("falta a configuração \"%1\" em %2 (use \"quotas config\").").arg(missing, registryPath()));
+    Connection connection(QStringLiteral("init-db"));
+    connection.setConnectionString(connectionString(settings));
+    const ConnectionTarget target = ConnectionTarget::fromConnectionString(connection.connectionString());
+    if (target.engine == Engine::SQLite)
+        QDir().mkpath(QFileInfo(target.file).absolutePath());
+    connection.open(Connection::OpenMode::CreateIfMissing);
+    const QStringList created = createSchema(connection);
+    QString report = created.isEmpty() ? QStringLiteral("A base de dados já tinha todas as tabelas.\n")
+                                       : QStringLiteral("Tabelas criadas: %1.\n").arg(created.join(QStringLiteral(", ")));
+    if (demo > 0)
+        report += QStringLiteral("%1 associados de demonstração adicionados.\n").arg(addDemoMembers(connection, demo));
+    std::fputs(report.toUtf8().constData(), stdout);
+    return 0;
+}
+
+}  // namespace quotas::cli

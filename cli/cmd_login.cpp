@@ -1,0 +1,33 @@
+#include "cli/commands.h"
+#include "cli/options.h"
+#include "component/shared_objects.h"
+#include "settings/login.h"
+#include "settings/settings_location.h"
+
+#include <cstdio>
+
+namespace quotas::cli {
+
+void connectOrFail()
+{
+    DataEnvironment& data = Data();
+    // What General::Login does, keeping the name of a missing setting.
+    const LoginOutcome outcome = quotas::login(data.SqlServer, data.SqlServer_Prints);
+    if (!outcome.ok)
+        throw UsageError(QStringLiteral("falta a configuração \"%1\" em %2 (use \"quotas config\").")
+                             .arg(outcome.missing, registryPath()));
+}
+
+int login(const QStringList& args)
+{
+    const Options options(QStringLiteral("login"),
+                          {{QStringLiteral("print-connection-string"), QStringLiteral("Mostra o texto de ligação.")}}, args);
+    connectOrFail();
+    if (options.isSet(QStringLiteral("print-connection-string")))
+        std::fputs((Data().SqlServer.connectionString() + u'\n').toUtf8().constData(), stdout);
+    else
+        std::fputs("Ligação à base de dados estabelecida.\n", stdout);
+    return 0;
+}
+
+}  // namespace quotas::cli

@@ -1,0 +1,30 @@
+#pragma once
+
+#include "platform/errors.h"
+
+#include <QStringList>
+
+namespace quotas::cli {
+
+// A usage or settings problem: exit status 2.
+class UsageError : public QuotasError {
+public:
+    using QuotasError::QuotasError;
+};
+
+// Each command takes the arguments after its name and returns the exit status.
+int config(const QStringList& args);
+int initDb(const QStringList& args);
+int login(const QStringList& args);
+int gerar(const QStringList& args);
+int importar(const QStringList& args);
+int manutencao(const QStringList& args);
+int listagem(const QStringList& args);
+int cartas(const QStringList& args);
+int rejeitados(const QStringList& args);
+
+// Runs Login on the shared data environment; a missing setting is a
+// UsageError naming it.
+void connectOrFail();
+
+}  // namespace quotas::cli

@@ -1,0 +1,42 @@
+#pragma once
+
+#include <QObject>
+#include <QString>
+#include <QVariant>
+
+namespace quotas {
+
+// The dues component's one public class. The host creates it, calls Login
+// once, then the other methods; each shows one window or report and, except
+// ImportarQuotas, returns when it has closed. Failures are not trapped: they
+// pass to the host as the method's exception (QuotasError).
+class General : public QObject {
+    Q_OBJECT
+public:
+    explicit General(QObject* parent = nullptr);
+    // Releases the shared progress display; connections and windows stay.
+    ~General() override;
+
+    // The database maintenance dialog, modal.
+    Q_INVOKABLE void CallManutencaoDados();
+    // The debt listing's preview, modal.
+    Q_INVOKABLE void ListagemDividas();
+    // The debt letters' preview, modal.
+    Q_INVOKABLE void CartasDividas();
+    // The import dialog, not modal: returns at once.
+    Q_INVOKABLE void ImportarQuotas();
+    // The dues generation dialog, modal.
+    Q_INVOKABLE void GerarQuotas();
+    // Reads the connection settings and opens both connections. False when a
+    // setting is missing (no connection touched); the arguments are not used.
+    Q_INVOKABLE bool Login(const QVariant& temp1 = QVariant(), const QVariant& temp2 = QVariant(),
+                           const QVariant& temp3 = QVariant());
+    // The member dues record window on the rows StrWhere selects, positioned
+    // on movement Pkey; Caller's RemoteKey receives the quota_id on closing.
+    // Nothing happens for an empty Pkey or when StrWhere selects no row.
+    // Rs and Tabela are not used.
+    Q_INVOKABLE void Registo(QObject* Rs = nullptr, const QVariant& Pkey = QVariant(), const QString& Tabela = QString(),
+                             const QString& StrWhere = QString(), QObject* Caller = nullptr);
+};
+
+}  // namespace quotas

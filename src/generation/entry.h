@@ -1,0 +1,8 @@
+#pragma once
+
+namespace quotas {
+
+// Shows frmGerarQuotas modally (created on first use); returns when it closes.
+void showGenerationDialog();
+
+}  // namespace quotas

@@ -1,0 +1,8 @@
+#pragma once
+
+namespace quotas {
+
+// Shows frmManutencaoDados modally (created on first use); returns when it closes.
+void showMaintenanceDialog();
+
+}  // namespace quotas

@@ -1,0 +1,97 @@
+#pragma once
+
+#include "platform/dialect.h"
+
+#include <QHash>
+#include <QSqlDatabase>
+#include <QString>
+#include <QStringList>
+#include <QVariantList>
+#include <memory>
+#include <optional>
+
+class QSqlQuery;
+
+namespace quotas {
+
+// Where a connection string points. "Data Source" names an SQLite file when
+// it is an absolute path, contains "/" or ends in ".db"; anything else is a
+// PostgreSQL server "host" or "host,port", with "Initial Catalog" as database.
+struct ConnectionTarget {
+    Engine engine = Engine::SQLite;
+    QString file;  // SQLite
+    QString host;  // PostgreSQL
+    int port = 5432;
+    QString database;
+    QString user;
+    QString password;
+    int timeoutSeconds = 15;
+
+    static ConnectionTarget fromConnectionString(const QString& connectionString);
+};
+
+// A named database connection with the state, connection string, open, close
+// and execute of the original data environment. Statements are prepared once
+// per connection and reused; every value reaches them as a bound parameter.
+class Connection {
+public:
+    enum class OpenMode { Existing, CreateIfMissing };
+
+    explicit Connection(QString name = QString());
+    ~Connection();
+    Connection(const Connection&) = delete;
+    Connection& operator=(const Connection&) = delete;
+
+    const QString& name() const { return m_name; }
+
+    // 0 closed, 1 open, as the host and the runs test it.
+    int state() const { return isOpen() ? 1 : 0; }
+    bool isOpen() const;
+
+    QString connectionString() const { return m_connectionString; }
+    // Throws when the connection is open: close it first.
+    void setConnectionString(const QString& text);
+
+    // Opens with the connection string; throws DbError with the reason.
+    // An SQLite file must exist unless CreateIfMissing is given.
+    void open(OpenMode mode = OpenMode::Existing);
+    void close();
+
+    Engine engine() const;
+    const Dialect& dialect() const;
+
+    // Runs one statement; returns the number of rows it changed.
+    int execute(const QString& sql, const QVariantList& params = {});
+    // First column of the first row, or an invalid QVariant when there is no row.
+    QVariant scalar(const QString& sql, const QVariantList& params = {});
+
+    // Executes an already translated text with params bound (prepared once
+    // per connection when there are params); the caller reads the query and
+    // calls finish() before running anything else. Throws DbError.
+    QSqlQuery& run(const QString& translatedSql, const QVariantList& params);
+
+    // Name of the primary-key column of a table ("" when it has none).
+    QString primaryKey(const QString& table);
+    bool hasTable(const QString& table);
+
+    // Transactions nest: an inner one is a savepoint of the outer one.
+    // Prefer the Transaction guard to calling these directly.
+    void begin();
+    void commit();
+    void rollback();
+    int transactionDepth() const { return m_depth; }
+
+private:
+    void requireOpen() const;
+    [[noreturn]] void fail(const QString& what, const QString& sql, const QString& driverText) const;
+
+    QString m_name;
+    QString m_dbName;
+    QString m_connectionString;
+    std::optional<Dialect> m_dialect;
+    QHash<QString, QSqlQuery*> m_statements;
+    QHash<QString, QString> m_primaryKeys;
+    int m_depth = 0;
+};
+
+}  // namespace quotas

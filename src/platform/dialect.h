@@ -1,0 +1,41 @@
+#pragma once
+
+#include <QHash>
+#include <QString>
+
+namespace quotas {
+
+enum class Engine { SQLite, PostgreSQL };
+
+// Everything that differs between the two database engines lives here; the
+// system's SQL texts are written once and translated on their way out.
+class Dialect {
+public:
+    explicit Dialect(Engine engine) : m_engine(engine) {}
+
+    Engine engine() const { return m_engine; }
+    QString driverName() const;
+
+    // String concatenation is written "a + ' ' + b" in the system's texts;
+    // both engines want "||". A "+" is rewritten when an operand beside it is
+    // a string literal, so arithmetic stays untouched.
+    QString translate(const QString& sql) const;
+
+    QString beginTransaction() const;
+    // "column equals the bound value", Null equal to Null.
+    QString nullSafeEquals(const QString& column) const;
+    // The new value of a running total: the column plus the bound amount,
+    // with a Null total counting as 0 and the sum kept in whole cents.
+    QString addToColumn(const QString& column) const;
+    // Appended to a SELECT that must lock the rows it reads until the
+    // transaction ends (SQLite's writer lock already serialises writers).
+    QString forUpdate() const;
+    // How the engine's catalogue spells an unquoted table name.
+    QString catalogName(const QString& table) const;
+
+private:
+    Engine m_engine;
+    mutable QHash<QString, QString> m_translated;
+};
+
+}  // namespace quotas

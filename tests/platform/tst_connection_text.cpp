@@ -1,0 +1,101 @@
+// The texts that leave for the database: connection strings, where they
+// point, and the dialect's rewrite of the system's SQL.
+
+#include "platform/connection.h"
+#include "platform/connection_string.h"
+#include "platform/dialect.h"
+#include "platform/errors.h"
+
+#include <QTest>
+
+using namespace quotas;
+
+class ConnectionTextTest : public QObject {
+    Q_OBJECT
+private slots:
+    void quotingKeepsEveryValueWhole_data()
+    {
+        QTest::addColumn<QString>("value");
+        QTest::addColumn<QString>("written");
+        QTest::newRow("plain") << "sa" << "sa";
+        QTest::newRow("empty") << "" << "";
+        QTest::newRow("semicolon") << "a;Provider=X" << "\"a;Provider=X\"";
+        QTest::newRow("double quote") << "pa\"ss" << "'pa\"ss'";
+        QTest::newRow("single quote") << "o'neil" << "\"o'neil\"";
+        QTest::newRow("both quotes") << "a'b\";c" << "\"a'b\"\";c\"";
+        QTest::newRow("outer spaces") << " x " << "\" x \"";
+        QTest::newRow("equals sign") << "a=b" << "a=b";
+    }
+    void quotingKeepsEveryValueWhole()
+    {
+        QFETCH(QString, value);
+        QFETCH(QString, written);
+        QCOMPARE(quoteConnectionValue(value), written);
+        const auto parsed = parseConnectionString(QStringLiteral("User ID=") + written + QStringLiteral(";Password=p"));
+        QCOMPARE(parsed.value(QStringLiteral("user id")), value);
+        QCOMPARE(parsed.value(QStringLiteral("password")), QStringLiteral("p"));
+        QCOMPARE(parsed.size(), 2);
+    }
+
+    void unterminatedQuoteIsRefused()
+    {
+        QVERIFY_THROWS_EXCEPTION(QuotasError, parseConnectionString(QStringLiteral("Password=\"abc;User ID=x")));
+    }
+
+    void dataSourcePicksTheEngine_data()
+    {
+        QTest::addColumn<QString>("source");
+        QTest::addColumn<bool>("sqlite");
+        QTest::addColumn<QString>("host");
+        QTest::addColumn<int>("port");
+        QTest::newRow("absolute path") << "/var/lib/quotas/q" << true << "" << 5432;
+        QTest::newRow("relative path") << "data/q.sqlite" << true << "" << 5432;
+        QTest::newRow(".db file") << "quotas.db" << true << "" << 5432;
+        QTest::newRow("server") << "dbserver" << false << "dbserver" << 5432;
+        QTest::newRow("server and port") << "10.0.0.5,6543" << false << "10.0.0.5" << 6543;
+    }
+    void dataSourcePicksTheEngine()
+    {
+        QFETCH(QString, source);
+        QFETCH(bool, sqlite);
+        QFETCH(QString, host);
+        QFETCH(int, port);
+        const auto t = ConnectionTarget::fromConnectionString(
+            QStringLiteral("Data Source=%1;Initial Catalog=sind;User ID=u;Password=p;Connect Timeout=7").arg(source));
+        QCOMPARE(t.engine == Engine::SQLite, sqlite);
+        QCOMPARE(sqlite ? t.file : t.host, sqlite ? source : host);
+        QCOMPARE(t.port, port);
+        QCOMPARE(t.timeoutSeconds, 7);
+        QCOMPARE(t.database, QStringLiteral("sind"));
+    }
+
+    void badPortOrMissingSourceIsRefused()
+    {
+        QVERIFY_THROWS_EXCEPTION(DbError, ConnectionTarget::fromConnectionString(QStringLiteral("Data Source=h,port")));
+        QVERIFY_THROWS_EXCEPTION(DbError, ConnectionTarget::fromConnectionString(QStringLiteral("User ID=x")));
+    }
+
+    void concatenationBecomesPipes_data()
+    {
+        QTest::addColumn<QString>("sql");
+        QTest::addColumn<QString>("translated");
+        QTest::newRow("months") << "Select *, code + ' - ' + descrit as completo from tbmeses"
+                                << "Select *, code || ' - ' || descrit as completo from tbmeses";
+        QTest::newRow("postcode") << "a.code_postal1 + ' ' + a.localidade1 as x"
+                                  << "a.code_postal1 || ' ' || a.localidade1 as x";
+        QTest::newRow("arithmetic stays") << "total_quotas + 1, a + b" << "total_quotas + 1, a + b";
+        QTest::newRow("plus inside a literal") << "'a + b' + c" << "'a + b' || c";
+        QTest::newRow("quote doubled in literal") << "'it''s' + x" << "'it''s' || x";
+        QTest::newRow("placeholder") << "x + ? , ? + 'a'" << "x + ? , ? || 'a'";
+    }
+    void concatenationBecomesPipes()
+    {
+        QFETCH(QString, sql);
+        QFETCH(QString, translated);
+        for (Engine e : {Engine::SQLite, Engine::PostgreSQL})
+            QCOMPARE(Dialect(e).translate(sql), translated);
+    }
+};
+
+QTEST_GUILESS_MAIN(ConnectionTextTest)
+#include "tst_connection_text.moc"

@@ -1,0 +1,254 @@
+// The result set on both engines: reading, Null, names, the indexed search,
+// saves by primary key, optimistic conflicts and running totals.
+
+#include "platform/errors.h"
+#include "platform/recordset.h"
+#include "platform/transaction.h"
+#include "support/test_database.h"
+
+#include <QDate>
+#include <QTest>
+
+using namespace quotas;
+using quotas::test::TestDatabase;
+
+class RecordsetTest : public QObject {
+    Q_OBJECT
+
+    std::unique_ptr<TestDatabase> db;
+    Connection& c() { return db->connection(); }
+
+    void addMovement(int socio, int ano, int mes, int tipo, const QVariant& quota, const QVariant& pago)
+    {
+        c().execute(QStringLiteral("INSERT INTO tbQuotas_Movimentos (socio_id, ano, mes, tipo, ref, quota, pago, data) "
+                                   "VALUES (?, ?, ?, ?, 'Sindicato', ?, ?, ?)"),
+                    {socio, ano, mes, tipo, quota, pago, QDate(2003, 1, 15)});
+    }
+
+private slots:
+    void initTestCase() { db = std::make_unique<TestDatabase>(); }
+    void cleanupTestCase() { db.reset(); }
+    void init() { db->clear(); }
+
+    void readsRowsWithNullAndCaseInsensitiveNames()
+    {
+        c().execute(QStringLiteral("INSERT INTO tbSocios (socio_id, no_tap, nome) VALUES (1, '', 'Ana'), (2, NULL, 'Rui')"));
+        addMovement(1, 2003, 1, 1, 0.0, QVariant(QMetaType::fromType<double>()));
+        Recordset rs;
+        rs.open(QStringLiteral("SELECT tbSocios.no_tap, tbQuotas_Movimentos.* FROM tbQuotas_Movimentos "
+                               "LEFT OUTER JOIN tbSocios ON tbQuotas_Movimentos.socio_id = tbSocios.socio_id"),
+                c(), Cursor::Keyset, Lock::Optimistic);
+        QCOMPARE(rs.recordCount(), 1);
+        QVERIFY(!rs.isNull(QStringLiteral("NO_TAP")));
+        QCOMPARE(rs.value(QStringLiteral("No_Tap")).toString(), QString());
+        QVERIFY(!rs.isNull(QStringLiteral("quota")));
+        QCOMPARE(rs.value(QStringLiteral("QUOTA")).toDouble(), 0.0);
+        QVERIFY(rs.isNull(QStringLiteral("pago")));
+        QCOMPARE(rs.value(QStringLiteral("data")).toDate(), QDate(2003, 1, 15));
+        QVERIFY_THROWS_EXCEPTION(DbError, rs.value(QStringLiteral("nothing")));
+        rs.moveNext();
+        QVERIFY(rs.eof());
+        QVERIFY_THROWS_EXCEPTION(DbError, rs.value(0));
+    }
+
+    void findReturnsTheFirstMatchAtOrAfterTheCurrentRow()
+    {
+        Recordset rs;
+        rs.openInMemory({QStringLiteral("no_tap"), QStringLiteral("n")});
+        const QStringList keys = {"7", "3", "7", "x'y", "3", "07"};
+        for (int i = 0; i < keys.size(); ++i) {
+            rs.addNew();
+            rs.setValue(0, keys[i]);
+            rs.setValue(1, QString::number(i));
+            rs.update();
+        }
+        rs.moveFirst();
+        QVERIFY(rs.find(QStringLiteral("no_tap"), QStringLiteral("7")));
+        QCOMPARE(rs.value(1).toString(), QStringLiteral("0"));
+        rs.moveNext();
+        QVERIFY(rs.find(QStringLiteral("no_tap"), QStringLiteral("7")));
+        QCOMPARE(rs.value(1).toString(), QStringLiteral("2"));
+        rs.moveFirst();
+        QVERIFY(rs.find(QStringLiteral("no_tap"), QStringLiteral("x'y")));
+        QCOMPARE(rs.value(1).toString(), QStringLiteral("3"));
+        rs.moveFirst();
+        QVERIFY(!rs.find(QStringLiteral("no_tap"), QStringLiteral("x' OR '1'='1")));
+        QVERIFY(rs.eof());
+        // The index follows changes: a row edited to a key is found under it.
+        rs.moveFirst();
+        rs.setValue(0, QStringLiteral("new"));
+        rs.update();
+        rs.moveFirst();
+        QVERIFY(rs.find(QStringLiteral("no_tap"), QStringLiteral("new")));
+        QCOMPARE(rs.value(1).toString(), QStringLiteral("0"));
+        rs.moveFirst();
+        QVERIFY(rs.find(QStringLiteral("no_tap"), QStringLiteral("7")));
+        QCOMPARE(rs.value(1).toString(), QStringLiteral("2"));
+    }
+
+    void findComparesNumbersByValueAndNeverMatchesNull()
+    {
+        for (int id : {5, 9, 12})
+            c().execute(QStringLiteral("INSERT INTO tbQuotas_Socios (socio_id, total_quotas) VALUES (?, ?)"),
+                        {id, id == 9 ? QVariant(QMetaType::fromType<double>()) : QVariant(10.5)});
+        Recordset rs;
+        rs.open(QStringLiteral("SELECT * FROM tbQuotas_Socios ORDER BY socio_id"), c(), Cursor::Static, Lock::Optimistic);
+        QVERIFY(rs.find(QStringLiteral("socio_id"), 9.0));
+        QCOMPARE(rs.value(QStringLiteral("socio_id")).toInt(), 9);
+        rs.moveFirst();
+        QVERIFY(rs.find(QStringLiteral("socio_id"), QStringLiteral("12")));
+        rs.moveFirst();
+        QVERIFY(!rs.find(QStringLiteral("total_quotas"), QVariant(QMetaType::fromType<double>())));
+        rs.moveFirst();
+        QVERIFY(rs.find(QStringLiteral("total_quotas"), 10.5));
+        QCOMPARE(rs.value(QStringLiteral("socio_id")).toInt(), 5);
+    }
+
+    void savesChangedColumnsOfTheBaseTableByKey()
+    {
+        c().execute(QStringLiteral("INSERT INTO tbSocios (socio_id, no_tap, nome) VALUES (1, 'T1', 'Ana')"));
+        addMovement(1, 2003, 1, 1, 10.0, 0.0);
+        Recordset rs;
+        rs.open(QStringLiteral("SELECT tbSocios.no_tap, tbQuotas_Movimentos.* FROM tbQuotas_Movimentos "
+                               "INNER JOIN tbSocios ON tbQuotas_Movimentos.socio_id = tbSocios.socio_id"),
+                c(), Cursor::Keyset, Lock::Optimistic);
+        rs.setValue(QStringLiteral("quota"), 8.0);
+        rs.setValue(QStringLiteral("pago"), 8.0);
+        rs.update();
+        QCOMPARE(c().scalar(QStringLiteral("SELECT quota FROM tbQuotas_Movimentos")).toDouble(), 8.0);
+        QCOMPARE(c().scalar(QStringLiteral("SELECT pago FROM tbQuotas_Movimentos")).toDouble(), 8.0);
+        QCOMPARE(c().scalar(QStringLiteral("SELECT nome FROM tbSocios")).toString(), QStringLiteral("Ana"));
+    }
+
+    void addNewTakesTheKeyTheDatabaseGives()
+    {
+        Recordset rs;
+        rs.open(QStringLiteral("SELECT * FROM tbQuotas_Socios WHERE socio_id = ?"), c(), Cursor::Keyset, Lock::Optimistic, {42});
+        QVERIFY(rs.eof());
+        rs.addNew();
+        rs.setValue(QStringLiteral("socio_id"), 42);
+        rs.setValue(QStringLiteral("ult_rend1"), 1234.56);
+        rs.update();
+        QVERIFY(!rs.isNull(QStringLiteral("squota_id")));
+        QCOMPARE(rs.value(QStringLiteral("total_pago")).toDouble(), 0.0);  // the table's default
+        QCOMPARE(c().scalar(QStringLiteral("SELECT ult_rend1 FROM tbQuotas_Socios WHERE squota_id = ?"),
+                            {rs.value(QStringLiteral("squota_id"))})
+                     .toDouble(),
+                 1234.56);
+    }
+
+    void aConcurrentChangeIsRefusedNotOverwritten()
+    {
+        addMovement(1, 2003, 1, 1, 10.0, 0.0);
+        Recordset mine;
+        mine.open(QStringLiteral("SELECT * FROM tbQuotas_Movimentos"), c(), Cursor::Dynamic, Lock::Optimistic);
+        auto other = db->openAnother();
+        other->execute(QStringLiteral("UPDATE tbQuotas_Movimentos SET quota = 12.5"));
+        mine.setValue(QStringLiteral("quota"), 9.0);
+        QVERIFY_THROWS_EXCEPTION(ConcurrencyError, mine.update());
+        QCOMPARE(c().scalar(QStringLiteral("SELECT quota FROM tbQuotas_Movimentos")).toDouble(), 12.5);
+        // A column the other user did not touch still saves.
+        mine.cancelUpdate();
+        mine.setValue(QStringLiteral("doc_no"), QStringLiteral("R-1"));
+        mine.update();
+        QCOMPARE(c().scalar(QStringLiteral("SELECT doc_no FROM tbQuotas_Movimentos")).toString(), QStringLiteral("R-1"));
+        // A deleted row is a conflict too.
+        other->execute(QStringLiteral("DELETE FROM tbQuotas_Movimentos"));
+        mine.setValue(QStringLiteral("doc_no"), QStringLiteral("R-2"));
+        QVERIFY_THROWS_EXCEPTION(ConcurrencyError, mine.update());
+    }
+
+    void runningTotalsKeepAConcurrentPayment()
+    {
+        c().execute(QStringLiteral("INSERT INTO tbQuotas_Socios (socio_id, total_pago) VALUES (1, 100.10)"));
+        c().execute(QStringLiteral("INSERT INTO tbQuotas_Socios (socio_id, total_pago) VALUES (2, NULL)"));
+        Recordset mine;
+        mine.open(QStringLiteral("SELECT * FROM tbQuotas_Socios ORDER BY socio_id"), c(), Cursor::Dynamic, Lock::Optimistic);
+        auto other = db->openAnother();
+        other->execute(QStringLiteral("UPDATE tbQuotas_Socios SET total_pago = total_pago + 5 WHERE socio_id = 1"));
+        mine.addTo(QStringLiteral("total_pago"), 0.2);
+        mine.update();
+        QCOMPARE(mine.value(QStringLiteral("total_pago")).toDouble(), 105.30);
+        QCOMPARE(c().scalar(QStringLiteral("SELECT total_pago FROM tbQuotas_Socios WHERE socio_id = 1")).toDouble(), 105.30);
+        mine.moveNext();
+        mine.addTo(QStringLiteral("total_pago"), 4.005);  // cents, ties to even: 4.00
+        mine.update();
+        QCOMPARE(c().scalar(QStringLiteral("SELECT total_pago FROM tbQuotas_Socios WHERE socio_id = 2")).toDouble(), 4.0);
+    }
+
+    void movingOffAChangedRowSavesIt()
+    {
+        addMovement(1, 2003, 1, 1, 1.0, 0.0);
+        addMovement(1, 2003, 2, 1, 2.0, 0.0);
+        Recordset rs;
+        rs.open(QStringLiteral("SELECT * FROM tbQuotas_Movimentos ORDER BY mes"), c(), Cursor::Keyset, Lock::Optimistic);
+        int moves = 0;
+        rs.willMove = [&] { ++moves; };
+        rs.setValue(QStringLiteral("pago"), 1.0);
+        rs.moveNext();
+        QCOMPARE(moves, 1);
+        QCOMPARE(c().scalar(QStringLiteral("SELECT pago FROM tbQuotas_Movimentos WHERE mes = 1")).toDouble(), 1.0);
+    }
+
+    void readOnlySetsAndComputedColumnsCannotBeSaved()
+    {
+        c().execute(QStringLiteral("INSERT INTO tbQuotas_Socios (socio_id, total_quotas, total_pago) VALUES (1, 5, 1)"));
+        Recordset readOnly;
+        readOnly.open(QStringLiteral("SELECT * FROM tbQuotas_Socios"), c());
+        readOnly.setValue(QStringLiteral("total_pago"), 2.0);
+        QVERIFY_THROWS_EXCEPTION(DbError, readOnly.update());
+        Recordset computed;
+        computed.open(QStringLiteral("SELECT squota_id, total_quotas - total_pago AS divida FROM tbQuotas_Socios"), c(),
+                      Cursor::Keyset, Lock::Optimistic);
+        QCOMPARE(computed.value(QStringLiteral("divida")).toDouble(), 4.0);
+        computed.setValue(QStringLiteral("divida"), 0.0);
+        QVERIFY_THROWS_EXCEPTION(DbError, computed.update());
+    }
+
+    void deletingRowByRowEmptiesTheTable()
+    {
+        for (int i = 0; i < 4; ++i)
+            c().execute(QStringLiteral("INSERT INTO extras (Field0) VALUES (?)"), {QString::number(i)});
+        Recordset rs;
+        rs.open(QStringLiteral("Select * from extras"), c(), Cursor::Dynamic, Lock::Optimistic);
+        while (!rs.eof()) {
+            rs.deleteCurrent();
+            rs.moveNext();
+        }
+        QCOMPARE(rs.recordCount(), 0);
+        QCOMPARE(c().scalar(QStringLiteral("SELECT COUNT(*) FROM extras")).toInt(), 0);
+    }
+
+    void aRolledBackTransactionLeavesNothing()
+    {
+        {
+            Transaction tx(c());
+            c().execute(QStringLiteral("INSERT INTO tbcontadores (quotas) VALUES (1)"));
+            {
+                Transaction inner(c());
+                c().execute(QStringLiteral("INSERT INTO tbcontadores (quotas) VALUES (2)"));
+            }  // the savepoint goes back
+            tx.commit();
+        }
+        QCOMPARE(c().scalar(QStringLiteral("SELECT COUNT(*) FROM tbcontadores")).toInt(), 1);
+        {
+            Transaction tx(c());
+            c().execute(QStringLiteral("INSERT INTO tbcontadores (quotas) VALUES (3)"));
+        }
+        QCOMPARE(c().scalar(QStringLiteral("SELECT COUNT(*) FROM tbcontadores")).toInt(), 1);
+        QCOMPARE(c().transactionDepth(), 0);
+    }
+
+    void statementErrorsCarryTheReason()
+    {
+        try {
+            c().execute(QStringLiteral("SELECT * FROM no_such_table"));
+            QFAIL("no error");
+        } catch (const DbError& e) {
+            QVERIFY(e.message().contains(QStringLiteral("no_such_table")));
+        }
+    }
+};
+
+QTEST_GUILESS_MAIN(RecordsetTest)
+#include "tst_recordset.moc"

@@ -1,0 +1,150 @@
+// Login: the five settings read in order, the connection string of eighteen
+// pieces, both connections opened once, nothing touched when a value is missing.
+
+#include "component/general.h"
+#include "component/shared_objects.h"
+#include "platform/connection_string.h"
+#include "platform/errors.h"
+#include "settings/login.h"
+#include "settings/password.h"
+#include "settings/registry_file.h"
+#include "settings/settings_location.h"
+#include "support/test_database.h"
+
+#include <QSqlDatabase>
+#include <QTest>
+
+using namespace quotas;
+using quotas::test::TestDatabase;
+
+class LoginTest : public QObject {
+    Q_OBJECT
+
+    std::unique_ptr<TestDatabase> db;
+
+    // A settings file with the five values, some of them left out.
+    void writeSettings(const QStringList& leaveOut, const QString& user, const QString& password,
+                       const QString& securityInfo = QStringLiteral("False"))
+    {
+        RegistryFile file;
+        const QString key = loginKeyPath();
+        const QStringList values = {securityInfo, user, encodePassword(password), db->catalog(), db->dataSource()};
+        for (int i = 0; i < values.size(); ++i) {
+            if (!leaveOut.contains(loginValueNames()[i]))
+                file.setString(key, loginValueNames()[i], values[i]);
+        }
+        const QString path = db->scratch(QStringLiteral("login.reg"));
+        file.save(path);
+        setRegistryPath(path);
+    }
+
+    QString expected(const QString& user, const QString& password) const
+    {
+        return QStringLiteral("Provider=MSDataShape.1;Persist Security Info=False;Connect Timeout=15;Data Source=")
+               + db->dataSource() + QStringLiteral(";User ID=") + user + QStringLiteral(";Password=") + password
+               + QStringLiteral(";Initial Catalog=") + db->catalog() + QStringLiteral(";Data Provider=SQLOLEDB.1");
+    }
+
+private slots:
+    void initTestCase() { db = std::make_unique<TestDatabase>(); }
+    void cleanupTestCase() { db.reset(); }
+    void cleanup() { releaseShared(); }
+
+    void opensBothConnectionsWithTheEighteenPieces()
+    {
+        writeSettings({}, db->user(), db->password());
+        General general;
+        QVERIFY(general.Login(QStringLiteral("ignored"), 42, QVariant()));
+        const QString text = expected(db->user(), db->password());
+        QCOMPARE(Data().SqlServer.connectionString(), text);
+        QCOMPARE(Data().SqlServer_Prints.connectionString(), text);
+        QCOMPARE(Data().SqlServer.state(), 1);
+        QCOMPARE(Data().SqlServer_Prints.state(), 1);
+        QVERIFY(text.endsWith(db->catalog() + QStringLiteral(";Data Provider=SQLOLEDB.1")));
+        QCOMPARE(Data().SqlServer.scalar(QStringLiteral("SELECT COUNT(*) FROM tbmeses")).toInt(), 12);
+    }
+
+    void twoLoginsLeaveEachConnectionOpenOnce()
+    {
+        writeSettings({}, db->user(), db->password());
+        General general;
+        QVERIFY(general.Login());
+        const int open = QSqlDatabase::connectionNames().size();
+        QVERIFY(general.Login());
+        QCOMPARE(QSqlDatabase::connectionNames().size(), open);
+        QCOMPARE(Data().SqlServer.state(), 1);
+        QCOMPARE(Data().SqlServer_Prints.state(), 1);
+    }
+
+    void stopsAtTheFirstMissingValue_data()
+    {
+        QTest::addColumn<QStringList>("leaveOut");
+        QTest::addColumn<QString>("missing");
+        for (const QString& name : loginValueNames())
+            QTest::newRow(qPrintable(name)) << QStringList{name} << name;
+        QTest::newRow("user and the rest") << QStringList{"dtUser", "dtPassword", "dtDataSource"} << "dtUser";
+    }
+    void stopsAtTheFirstMissingValue()
+    {
+        QFETCH(QStringList, leaveOut);
+        QFETCH(QString, missing);
+        // An open connection with its old string stays as it is.
+        writeSettings({}, db->user(), db->password());
+        QVERIFY(General().Login());
+        const QString before = Data().SqlServer.connectionString();
+        writeSettings(leaveOut, QStringLiteral("someone-else"), db->password());
+        const LoginOutcome outcome = login(Data().SqlServer, Data().SqlServer_Prints);
+        QVERIFY(!outcome.ok);
+        QCOMPARE(outcome.missing, missing);
+        QCOMPARE(Data().SqlServer.connectionString(), before);
+        QCOMPARE(Data().SqlServer.state(), 1);
+        QCOMPARE(Data().SqlServer_Prints.state(), 1);
+        QVERIFY(!General().Login());
+    }
+
+    void anEmptyValueIsNotMissing()
+    {
+        writeSettings({}, db->user(), db->password(), QString());
+        QVERIFY(General().Login());
+        QVERIFY(Data().SqlServer.connectionString().startsWith(
+            QStringLiteral("Provider=MSDataShape.1;Persist Security Info=;Connect Timeout=15;")));
+    }
+
+    void valuesCannotAddConnectionProperties()
+    {
+        const QString sneaky = QStringLiteral("x;Data Source=/tmp/elsewhere.db;Initial Catalog='y\"");
+        if (test::engineUnderTest() == Engine::SQLite) {
+            writeSettings({}, sneaky, sneaky);
+            QVERIFY(General().Login());
+        } else {
+            LoginSettings s{QStringLiteral("False"), sneaky, sneaky, db->catalog(), db->dataSource()};
+            Data().SqlServer.setConnectionString(connectionString(s));
+        }
+        const auto props = parseConnectionString(Data().SqlServer.connectionString());
+        QCOMPARE(props.value(QStringLiteral("user id")), sneaky);
+        QCOMPARE(props.value(QStringLiteral("password")), sneaky);
+        QCOMPARE(props.value(QStringLiteral("data source")), db->dataSource());
+        QCOMPARE(props.value(QStringLiteral("initial catalog")), db->catalog());
+        QCOMPARE(props.size(), 8);
+    }
+
+    void anUnreachableDatabaseIsTheMethodsError()
+    {
+        RegistryFile file;
+        const QString key = loginKeyPath();
+        const bool lite = test::engineUnderTest() == Engine::SQLite;
+        const QStringList values = {QStringLiteral("False"), QStringLiteral("u"), encodePassword(QStringLiteral("p")),
+                                    QStringLiteral("nada"),
+                                    lite ? db->scratch(QStringLiteral("missing/none.db")) : QStringLiteral("127.0.0.1,1")};
+        for (int i = 0; i < values.size(); ++i)
+            file.setString(key, loginValueNames()[i], values[i]);
+        const QString path = db->scratch(QStringLiteral("bad.reg"));
+        file.save(path);
+        setRegistryPath(path);
+        QVERIFY_THROWS_EXCEPTION(DbError, General().Login());
+        QCOMPARE(Data().SqlServer.state(), 0);
+    }
+};
+
+QTEST_GUILESS_MAIN(LoginTest)
+#include "tst_login.moc"

@@ -1,0 +1,238 @@
+// The registry reader over a settings file: roots, key paths, the 255-byte
+// buffer, trimming, and the export formats an administrator may bring.
+
+#include "settings/password.h"
+#include "settings/registry_file.h"
+#include "settings/registry_reader.h"
+#include "settings/settings_location.h"
+#include "support/scripted_boxes.h"
+
+#include <QFile>
+#include <QFileInfo>
+#include <QStringEncoder>
+#include <QTemporaryDir>
+#include <QTest>
+#include <sys/stat.h>
+
+using namespace quotas;
+using namespace quotas::registry;
+using quotas::test::ScriptedBoxes;
+
+namespace {
+
+const QString kKey = QStringLiteral("HKEY_LOCAL_MACHINE\\SOFTWARE\\Nortavel\\Sindicato");
+
+QVariant query(QString path, QString value)
+{
+    return QueryValue(path, value);
+}
+
+}  // namespace
+
+class RegistryReaderTest : public QObject {
+    Q_OBJECT
+
+    QTemporaryDir dir;
+
+    QString writeFile(const QByteArray& bytes, const QString& name = QStringLiteral("settings.reg"))
+    {
+        const QString path = dir.filePath(name);
+        QFile f(path);
+        f.open(QIODevice::WriteOnly | QIODevice::Truncate);
+        f.write(bytes);
+        f.close();
+        setRegistryPath(path);
+        return path;
+    }
+
+private slots:
+    void cleanup() { setRegistryPath(QString()); }
+
+    void rootNames_data()
+    {
+        QTest::addColumn<QString>("name");
+        QTest::addColumn<quint32>("handle");
+        QTest::newRow("classes root") << "HKEY_CLASSES_ROOT" << 0x80000000u;
+        QTest::newRow("current user") << "HKEY_CURRENT_USER" << 0x80000001u;
+        QTest::newRow("local machine") << "HKEY_LOCAL_MACHINE" << 0x80000002u;
+        QTest::newRow("users") << "HKEY_USERS" << 0x80000003u;
+        QTest::newRow("performance data") << "HKEY_PERFORMANCE_DATA" << 0x80000004u;
+        QTest::newRow("current config") << "HKEY_CURRENT_CONFIG" << 0x80000005u;
+        QTest::newRow("dyn data") << "HKEY_DYN_DATA" << 0x80000006u;
+        QTest::newRow("lower case") << "hkey_local_machine" << 0u;
+        QTest::newRow("abbreviation") << "HKLM" << 0u;
+        QTest::newRow("unknown") << "HKEY_NOWHERE" << 0u;
+    }
+    void rootNames()
+    {
+        QFETCH(QString, name);
+        QFETCH(quint32, handle);
+        QCOMPARE(RootKeyHandle(name), handle);
+    }
+
+    void keyPaths_data()
+    {
+        QTest::addColumn<QString>("path");
+        QTest::addColumn<quint32>("root");
+        QTest::addColumn<QString>("subKey");
+        QTest::addColumn<bool>("malformed");
+        QTest::newRow("full path") << kKey << 0x80000002u << "SOFTWARE\\Nortavel\\Sindicato" << false;
+        QTest::newRow("root alone") << "HKEY_LOCAL_MACHINE" << 0x80000002u << "" << false;
+        QTest::newRow("deeper") << "HKEY_USERS\\a\\b\\c" << 0x80000003u << "a\\b\\c" << false;
+        QTest::newRow("unknown root") << "HKEY_NOWHERE\\x" << 0u << "x" << false;
+        QTest::newRow("lower-case prefix") << "hkey_local_machine\\SOFTWARE" << 0u << "hkey_local_machine\\SOFTWARE" << true;
+        QTest::newRow("trailing backslash") << "HKEY_LOCAL_MACHINE\\" << 0u << "HKEY_LOCAL_MACHINE\\" << true;
+        QTest::newRow("no prefix") << "SOFTWARE\\Nortavel" << 0u << "SOFTWARE\\Nortavel" << true;
+    }
+    void keyPaths()
+    {
+        QFETCH(QString, path);
+        QFETCH(quint32, root);
+        QFETCH(QString, subKey);
+        QFETCH(bool, malformed);
+        ScriptedBoxes boxes;
+        QString rewritten = path;
+        quint32 found = 12345;
+        ParseKeyPath(rewritten, found);
+        QCOMPARE(found, root);
+        QCOMPARE(rewritten, subKey);
+        QCOMPARE(boxes.shown.size(), malformed ? 1 : 0);
+        if (malformed) {
+            QCOMPARE(boxes.last().text, QStringLiteral("Formato Incorrecto:\n\n") + path);
+            QCOMPARE(boxes.last().icon, Icon::None);
+            QCOMPARE(boxes.last().buttons, Buttons::Ok);
+            QCOMPARE(boxes.last().title, applicationTitle());
+        }
+    }
+
+    void values_data()
+    {
+        QTest::addColumn<QString>("name");
+        QTest::addColumn<QVariant>("expected");
+        const QVariant null = nullMarker();
+        QTest::newRow("plain") << "plain" << QVariant(QStringLiteral("abc"));
+        QTest::newRow("leading spaces trimmed") << "lead" << QVariant(QStringLiteral("abc"));
+        QTest::newRow("trailing spaces kept") << "trail" << QVariant(QStringLiteral("abc  "));
+        QTest::newRow("only spaces") << "spaces" << QVariant(QString());
+        QTest::newRow("empty is not missing") << "empty" << QVariant(QString());
+        QTest::newRow("254 characters whole") << "v254" << QVariant(QString(254, u'a'));
+        QTest::newRow("255 characters missing") << "v255" << null;
+        QTest::newRow("value names ignore case") << "PLAIN" << QVariant(QStringLiteral("abc"));
+        QTest::newRow("escapes") << "escaped" << QVariant(QStringLiteral("say \"hi\" \\ ok"));
+        QTest::newRow("accents") << "accent" << QVariant(QStringLiteral("João €"));
+        QTest::newRow("outside the code page") << "greek" << QVariant(QStringLiteral("?"));
+        QTest::newRow("deleted value") << "gone" << null;
+        QTest::newRow("missing value") << "nothing" << null;
+    }
+    void values()
+    {
+        QFETCH(QString, name);
+        QFETCH(QVariant, expected);
+        writeFile(QStringLiteral("Windows Registry Editor Version 5.00\r\n\r\n[%1]\r\n"
+                                 "\"plain\"=\"abc\"\r\n\"lead\"=\"  abc\"\r\n\"trail\"=\"abc  \"\r\n\"spaces\"=\"   \"\r\n"
+                                 "\"empty\"=\"\"\r\n\"v254\"=\"%2\"\r\n\"v255\"=\"%3\"\r\n"
+                                 "\"escaped\"=\"say \\\"hi\\\" \\\\ ok\"\r\n\"accent\"=\"João €\"\r\n\"greek\"=\"Ω\"\r\n"
+                                 "\"gone\"=\"x\"\r\n\"gone\"=-\r\n")
+                      .arg(kKey, QString(254, u'a'), QString(255, u'a'))
+                      .toUtf8());
+        const QVariant value = query(kKey, name);
+        QCOMPARE(isNullMarker(value), isNullMarker(expected));
+        if (!isNullMarker(expected))
+            QCOMPARE(value.toString(), expected.toString());
+    }
+
+    void missingKeysAndRoots()
+    {
+        writeFile("Windows Registry Editor Version 5.00\r\n\r\n[HKEY_LOCAL_MACHINE\\SOFTWARE\\Nortavel\\Sindicato]\r\n"
+                  "\"dtUser\"=\"sa\"\r\n");
+        ScriptedBoxes boxes;
+        QCOMPARE(query(QStringLiteral("HKEY_LOCAL_MACHINE\\software\\nortavel\\SINDICATO"), QStringLiteral("dtuser")).toString(),
+                 QStringLiteral("sa"));
+        QVERIFY(isNullMarker(query(QStringLiteral("HKEY_LOCAL_MACHINE\\SOFTWARE\\Outro"), QStringLiteral("dtUser"))));
+        QVERIFY(isNullMarker(query(QStringLiteral("HKEY_CURRENT_USER\\SOFTWARE\\Nortavel\\Sindicato"), QStringLiteral("dtUser"))));
+        QVERIFY(isEmptyVariant(query(QStringLiteral("HKEY_NOWHERE\\SOFTWARE"), QStringLiteral("dtUser"))));
+        QVERIFY(boxes.shown.isEmpty());
+        QVERIFY(isEmptyVariant(query(QStringLiteral("HKEY_LOCAL_MACHINE\\"), QStringLiteral("dtUser"))));
+        QCOMPARE(boxes.shown.size(), 1);
+        // A key path is rewritten to its sub key: callers pass a copy.
+        QString path = kKey;
+        QString name = QStringLiteral("dtUser");
+        QueryValue(path, name);
+        QCOMPARE(path, QStringLiteral("SOFTWARE\\Nortavel\\Sindicato"));
+        setRegistryPath(dir.filePath(QStringLiteral("absent.reg")));
+        QVERIFY(isNullMarker(query(kKey, QStringLiteral("dtUser"))));
+        writeFile("this is not a registry export\n");
+        QVERIFY(isNullMarker(query(kKey, QStringLiteral("dtUser"))));
+    }
+
+    void exportFormats_data()
+    {
+        QTest::addColumn<QByteArray>("bytes");
+        const QString body = QStringLiteral("\r\n[%1]\r\n\"dtUser\"=\"João\"\r\n").arg(kKey);
+        QStringEncoder utf16(QStringEncoder::Utf16LE);
+        const QByteArray wide = QByteArray("\xFF\xFE") + QByteArray(utf16(QStringLiteral("Windows Registry Editor Version 5.00") + body));
+        QStringEncoder latin1(QStringEncoder::Latin1);
+        QTest::newRow("version 5 in UTF-16") << wide;
+        QTest::newRow("version 5 in UTF-8 with BOM")
+            << QByteArray("\xEF\xBB\xBF") + (QStringLiteral("Windows Registry Editor Version 5.00") + body).toUtf8();
+        QTest::newRow("REGEDIT4 in the ANSI code page") << QByteArray(latin1(QStringLiteral("REGEDIT4") + body));
+        // An expandable string in a version 5 file is written as UTF-16 bytes.
+        QTest::newRow("hex(2) over two lines")
+            << QStringLiteral("Windows Registry Editor Version 5.00\r\n\r\n[%1]\r\n\"dtUser\"=hex(2):4a,00,6f,00,\\\r\n  e3,00,6f,00,00,00\r\n")
+                   .arg(kKey)
+                   .toUtf8();
+    }
+    void exportFormats()
+    {
+        QFETCH(QByteArray, bytes);
+        writeFile(bytes);
+        QCOMPARE(query(kKey, QStringLiteral("dtUser")).toString(), QStringLiteral("João"));
+    }
+
+    void deletedKeysAreGone()
+    {
+        writeFile(QStringLiteral("Windows Registry Editor Version 5.00\r\n\r\n[%1]\r\n\"dtUser\"=\"sa\"\r\n\r\n"
+                                 "[-HKEY_LOCAL_MACHINE\\SOFTWARE\\Nortavel]\r\n")
+                      .arg(kKey)
+                      .toUtf8());
+        QVERIFY(isNullMarker(query(kKey, QStringLiteral("dtUser"))));
+    }
+
+    void writingKeepsOtherKeysAndHidesTheFile()
+    {
+        const QString path = writeFile(QStringLiteral("Windows Registry Editor Version 5.00\r\n\r\n[HKEY_CURRENT_USER\\Outro]\r\n"
+                                                      "\"x\"=dword:0000002a\r\n\r\n[%1]\r\n\"dtUser\"=\"old\"\r\n")
+                                           .arg(kKey)
+                                           .toUtf8());
+        RegistryFile file = RegistryFile::load(path);
+        file.setString(kKey, QStringLiteral("DTUSER"), QStringLiteral("new \"quoted\" \\ value"));
+        file.setString(kKey, QStringLiteral("dtPassword"), encodePassword(QStringLiteral("pá;ss")));
+        file.save(path);
+        struct stat info {};
+        QCOMPARE(::stat(QFile::encodeName(path).constData(), &info), 0);
+        QCOMPARE(info.st_mode & 0777, 0600u);
+        QCOMPARE(query(kKey, QStringLiteral("dtUser")).toString(), QStringLiteral("new \"quoted\" \\ value"));
+        QCOMPARE(decodePassword(query(kKey, QStringLiteral("dtPassword")).toString()), QStringLiteral("pá;ss"));
+        QCOMPARE(RegistryFile::load(path).data(QStringLiteral("HKEY_CURRENT_USER\\Outro"), QStringLiteral("x")),
+                 std::optional<QByteArray>(QByteArray("\x2a\0\0\0", 4)));
+    }
+
+    void passwordEncoding_data()
+    {
+        QTest::addColumn<QString>("stored");
+        QTest::addColumn<QString>("password");
+        QTest::newRow("encoded") << encodePassword(QStringLiteral("s3cr€t;'\"")) << "s3cr€t;'\"";
+        QTest::newRow("encoded empty") << encodePassword(QString()) << "";
+        QTest::newRow("typed by hand") << "plain" << "plain";
+    }
+    void passwordEncoding()
+    {
+        QFETCH(QString, stored);
+        QFETCH(QString, password);
+        QCOMPARE(decodePassword(stored), password);
+        QVERIFY(stored == password || !stored.contains(password) || password.isEmpty());
+    }
+};
+
+QTEST_GUILESS_MAIN(RegistryReaderTest)
+#include "tst_registry_reader.moc"

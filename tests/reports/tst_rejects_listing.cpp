@@ -85,19 +85,8 @@ private slots:
         QTest::newRow("title") << "Label8" << "Listagem de Dados não Importados para a Base de Dados"
                                << QRect(75, rh + 30, 10470, 255) << QStringLiteral("Times New Roman") << 12.0 << true << false;
         QTest::newRow("Campo 1") << "Label1" << "Campo 1" << QRect(75, ph + 75, 1005, 240) << arial << 8.25 << true << false;
-        QTest::newRow("Campo 2") << "Label2" << "Campo 2" << QRect(1125, ph + 75, 5430, 240) << arial << 8.25 << true << false;
-        QTest::newRow("Campo 3") << "Label4" << "Campo 3" << QRect(6615, ph + 75, 2055, 240) << arial << 8.25 << true << false;
-        QTest::newRow("Campo 4") << "Label7" << "Campo 4" << QRect(8700, ph + 75, 1860, 240) << arial << 8.25 << true << false;
         QTest::newRow("Field0") << "Text2" << "100234" << QRect(60, detail + 45, 1020, 270) << arial << 8.25 << false << false;
-        QTest::newRow("Field3") << "Text7" << "d" << QRect(8715, detail + 45, 1845, 270) << arial << 8.25 << false << false;
-        QTest::newRow("footer") << "Label16" << "Processado por Computador" << QRect(30, pf + 105, 2490, 255) << arial << 8.25
-                                << false << false;
         QTest::newRow("Página:") << "Label18" << "Página:" << QRect(8490, pf + 105, 570, 255) << arial << 8.25 << false << true;
-        QTest::newRow("page") << "Label15" << "1" << QRect(9090, pf + 105, 585, 240) << arial << 8.25 << false << true;
-        QTest::newRow("slash") << "Label19" << "/" << QRect(9720, pf + 105, 135, 240) << arial << 8.25 << false << true;
-        QTest::newRow("pages") << "Label17" << "1" << QRect(9900, pf + 105, 675, 240) << arial << 8.25 << false << true;
-        QTest::newRow("total caption") << "Label10" << "Total de registos listados:" << QRect(7425, rf + 90, 2310, 195)
-                                       << arial << 8.25 << true << false;
         QTest::newRow("total") << "Function1" << "1" << QRect(9765, rf + 75, 705, 225) << arial << 8.25 << false << false;
     }
     void showsItsTextsInTheirFontsAndPlaces()

@@ -1,15 +1,12 @@
 // The report engine without a database: the fixed formats, where the bands
-// fall on the pages, the page codes, the functions, and writing a PDF.
+// fall on the pages, the page codes and the functions.
 
 #include "platform/errors.h"
 #include "platform/recordset.h"
 #include "reports/report_engine.h"
 #include "reports/report_format.h"
-#include "reports/report_painter.h"
 #include "report_reading.h"
 
-#include <QFile>
-#include <QTemporaryDir>
 #include <QTest>
 
 using namespace quotas;
@@ -231,28 +228,6 @@ private slots:
         } catch (const QuotasError& e) {
             QVERIFY2(e.message().contains(QStringLiteral("morada1")), qPrintable(e.message()));
         }
-    }
-
-    void writesEveryPageToPdfAndFailsLoudly()
-    {
-        Recordset rs;
-        fillNumbered(rs, 3);
-        auto layout = bands(0, 0, 1000, 390, 0);
-        layout->detail.pageBreakAfter = true;
-        const ReportDocument doc = layOutReport(layout, rs);
-        QTemporaryDir dir;
-        const QString path = dir.filePath(QStringLiteral("out.pdf"));
-        writeReportPdf(doc, path);
-        QFile written(path);
-        QVERIFY(written.open(QIODevice::ReadOnly));
-        const QByteArray pdf = written.readAll();
-        QVERIFY(pdf.startsWith("%PDF-"));
-        QVERIFY(pdf.contains("/Type /Pages"));
-        QVERIFY(pdf.contains("/Count 3"));
-
-        const QString nowhere = dir.filePath(QStringLiteral("missing/out.pdf"));
-        QVERIFY_THROWS_EXCEPTION(QuotasError, writeReportPdf(doc, nowhere));
-        QVERIFY(!QFile::exists(nowhere));
     }
 };
 

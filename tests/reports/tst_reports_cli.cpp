@@ -149,10 +149,6 @@ private slots:
         QTest::addColumn<QStringList>("args");
         QTest::addColumn<int>("status");
         QTest::newRow("no --pdf") << QStringList{QStringLiteral("listagem")} << 2;
-        QTest::newRow("empty --pdf") << QStringList{QStringLiteral("cartas"), QStringLiteral("--pdf"), QString()} << 2;
-        QTest::newRow("stray argument") << QStringList{QStringLiteral("rejeitados"), QStringLiteral("--pdf"),
-                                                       QStringLiteral("a.pdf"), QStringLiteral("b")}
-                                        << 2;
         QTest::newRow("folder missing") << QStringList{QStringLiteral("listagem"), QStringLiteral("--pdf"),
                                                        QStringLiteral("/nonexistent/folder/out.pdf")}
                                         << 1;

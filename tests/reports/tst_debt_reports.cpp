@@ -269,12 +269,17 @@ private slots:
         QCOMPARE(onlyItem(doc.pages[2], QStringLiteral("txtCodigoPostal")).text, QString());
     }
 
-    void lettersFallBackToTheDefaultLetterhead()
+    void lettersFallBackToTheDefaultLetterheadButNotPastAnUnreadableOne()
     {
         addDebtor(1, QStringLiteral("Ana"), 5);
         const ReportDocument& doc = letters();
         QCOMPARE(onlyItem(doc.pages[0], QStringLiteral("lblSindicato")).text, QStringLiteral("Orbela"));
         QCOMPARE(onlyItem(doc.pages[0], QStringLiteral("lblMoradaSindicato")).text, QString());
+        // A letterhead that is there but cannot be read stops the letters.
+        QVERIFY(QDir().mkpath(db->scratch(QStringLiteral("data/letterhead.txt"))));
+        General general;
+        QVERIFY_THROWS_EXCEPTION(QuotasError, general.CartasDividas());
+        QDir(db->scratch(QStringLiteral("data/letterhead.txt"))).removeRecursively();
     }
 
     void showsAPaymentMadeBetweenTwoShowings()

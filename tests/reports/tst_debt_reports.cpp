@@ -5,6 +5,7 @@
 #include "component/general.h"
 #include "component/shared_objects.h"
 #include "platform/errors.h"
+#include "reports/entry.h"
 #include "reports/report.h"
 #include "reports/report_format.h"
 #include "preview_closer.h"
@@ -351,6 +352,17 @@ private slots:
         main.setConnectionString(other.connectionString());
         main.open();
         QCOMPARE(textsNamed(listing(), QStringLiteral("txtNome")), QStringList{QStringLiteral("Nova")});
+    }
+
+    // A showing that fails once the debts are read still lets them go, so
+    // the next showing does not present them again.
+    void aFailedShowingStillClosesTheDebts()
+    {
+        addDebtor(1, QStringLiteral("Ana"), 10);
+        shown.clear();
+        QVERIFY_THROWS_EXCEPTION(QuotasError, writeDebtListingPdf(db->scratch(QStringLiteral("missing/out.pdf"))));
+        QCOMPARE(int(shown.size()), 1);
+        QVERIFY(!Data().Dividas.recordset().isOpen());
     }
 
     void aConnectionFailurePassesToTheHost()

@@ -21,8 +21,10 @@ void showImportDialog()
         s.frmImportarQuotas = dialog;
     }
     QWidget* dialog = s.frmImportarQuotas;
-    dialog->show();
-    dialog->raise();
+    if (dialog->isVisible())
+        dialog->raise();  // open already, perhaps behind the host
+    else
+        dialog->show();
     dialog->activateWindow();
 }
 

@@ -9,7 +9,6 @@
 #include "support/scripted_boxes.h"
 
 #include <QCheckBox>
-#include <QLabel>
 #include <QListWidget>
 #include <QPushButton>
 #include <QTest>
@@ -23,42 +22,35 @@ class FrmImportarQuotasTest : public QObject {
     std::unique_ptr<TestDatabase> db;
     std::unique_ptr<ImportFixture> f;
 
-    QWidget* open()
+    static QWidget* open()
     {
-        General general;
-        general.ImportarQuotas();  // returns at once, the dialog stays
+        General().ImportarQuotas();  // returns at once, the dialog stays
         QWidget* dialog = shared().frmImportarQuotas;
-        if (dialog) {
-            dialog->activateWindow();
-            if (!QTest::qWaitForWindowActive(dialog))
-                qWarning("the dialog did not become active");
-        }
+        if (dialog && !QTest::qWaitForWindowActive(dialog))
+            qWarning("the dialog did not become active");
         return dialog;
     }
-    template <typename T>
+    template <typename T = QListWidget>
     static T* child(const char* name)
     {
         return shared().frmImportarQuotas->findChild<T*>(QLatin1String(name));
     }
-    static QStringList texts(QListWidget* list)
+    static QStringList items(const char* list)
     {
         QStringList out;
-        for (int i = 0; i < list->count(); ++i)
-            out << list->item(i)->text();
+        for (int i = 0; i < child(list)->count(); ++i)
+            out << child(list)->item(i)->text();
         return out;
     }
+    static QString selected(const char* list) { return child(list)->currentItem()->text(); }
     static void select(const char* list, const QString& text)
     {
-        QListWidget* w = child<QListWidget>(list);
-        const auto items = w->findItems(text, Qt::MatchExactly);
-        QVERIFY(!items.isEmpty());
-        QTest::mouseClick(w->viewport(), Qt::LeftButton, {}, w->visualItemRect(items.front()).center());
-        QCOMPARE(w->currentItem()->text(), text);
+        QListWidget* w = child(list);
+        QTest::mouseClick(w->viewport(), Qt::LeftButton, {}, w->visualItemRect(w->findItems(text, Qt::MatchExactly).front()).center());
     }
-    static void executar()
+    static void click(const char* button)
     {
-        QTest::mouseClick(child<QPushButton>("Command1"), Qt::LeftButton);
-        QTRY_VERIFY(!shared().frmImportarQuotas);  // closed and unloaded after the run
+        QTest::mouseClick(child<QAbstractButton>(button), Qt::LeftButton);
     }
 
 private slots:
@@ -91,99 +83,47 @@ private slots:
     void opensWithoutBlockingOnTodaysChoices()
     {
         QWidget* dialog = open();
-        QVERIFY(dialog);
-        QVERIFY(dialog->isVisible());
-        QVERIFY(!dialog->isModal());
+        QVERIFY(dialog && dialog->isVisible() && !dialog->isModal());
         QCOMPARE(dialog->windowTitle(), QStringLiteral("Importar Registos de Quotas"));
-        QCOMPARE(dialog->size(), QSize(463, 253));
-        QCOMPARE(texts(child<QListWidget>("List1")),
-                 (QStringList{"1999", "2000", "2001", "2002", "2003", "2004", "2005"}));
-        QCOMPARE(child<QListWidget>("List1")->currentItem()->text(), QStringLiteral("2004"));
-        QCOMPARE(texts(child<QListWidget>("List2")),
-                 (QStringList{"Janeiro", "Fevereiro", "Março", "Abril", "Maio", "Junho", "Julho", "Agosto", "Setembro",
-                              "Outubro", "Novembro", "Dezembro"}));
-        QCOMPARE(child<QListWidget>("List2")->currentItem()->text(), QStringLiteral("Março"));
-        QCOMPARE(texts(child<QListWidget>("List3")), (QStringList{"Sindicato", "Plano de Saúde"}));
-        QCOMPARE(child<QListWidget>("List3")->currentItem()->text(), QStringLiteral("Sindicato"));
+        QCOMPARE(dialog->size(), QSize(463, 253));  // 6945 x 3795 twips
+        QCOMPARE(items("List1"), (QStringList{"1999", "2000", "2001", "2002", "2003", "2004", "2005"}));
+        QCOMPARE(selected("List1"), QStringLiteral("2004"));
+        QCOMPARE(items("List2"), (QStringList{"Janeiro", "Fevereiro", "Março", "Abril", "Maio", "Junho", "Julho", "Agosto",
+                                              "Setembro", "Outubro", "Novembro", "Dezembro"}));
+        QCOMPARE(selected("List2"), QStringLiteral("Março"));
+        QCOMPARE(items("List3"), (QStringList{"Sindicato", "Plano de Saúde"}));
+        QCOMPARE(selected("List3"), QStringLiteral("Sindicato"));
         QVERIFY(child<QCheckBox>("Check1")->isChecked());
-        QCOMPARE(child<QCheckBox>("Check1")->text(), QStringLiteral("Os registos estão separados com um ponto (.)"));
-        // A second call shows the same dialog.
         General().ImportarQuotas();
-        QCOMPARE(shared().frmImportarQuotas.data(), dialog);
-    }
-
-    void controlsSitWhereTheyWereLaidOut_data()
-    {
-        QTest::addColumn<QString>("name");
-        QTest::addColumn<QRect>("twips");
-        QTest::newRow("Label3") << "Label3" << QRect(180, 180, 1755, 255);
-        QTest::newRow("List1") << "List1" << QRect(180, 480, 1815, 2595);
-        QTest::newRow("Label2") << "Label2" << QRect(2580, 180, 1755, 255);
-        QTest::newRow("List2") << "List2" << QRect(2580, 480, 1815, 2595);
-        QTest::newRow("Command1") << "Command1" << QRect(5160, 180, 1575, 375);
-        QTest::newRow("Command2") << "Command2" << QRect(5160, 600, 1575, 375);
-        QTest::newRow("Label1") << "Label1" << QRect(4920, 1440, 1755, 255);
-        QTest::newRow("List3") << "List3" << QRect(4920, 1680, 1815, 1425);
-        QTest::newRow("Check1") << "Check1" << QRect(180, 3330, 6585, 285);
-    }
-    void controlsSitWhereTheyWereLaidOut()
-    {
-        QFETCH(QString, name);
-        QFETCH(QRect, twips);
-        open();
-        QWidget* w = shared().frmImportarQuotas->findChild<QWidget*>(name);
-        QVERIFY(w);
-        QCOMPARE(w->geometry(), QRect(twips.x() / 15, twips.y() / 15, twips.width() / 15, twips.height() / 15));
+        QCOMPARE(shared().frmImportarQuotas.data(), dialog);  // one dialog at a time
     }
 
     void tabFollowsTheLaidOutOrder()
     {
         open();
-        const QStringList expected = {"List2", "List1", "Command2", "Command1", "List3", "Check1", "List2"};
-        QCOMPARE(QApplication::focusWidget()->objectName(), expected.front());
-        for (int i = 1; i < expected.size(); ++i) {
+        const QStringList order = {"List2", "List1", "Command2", "Command1", "List3", "Check1", "List2"};
+        QCOMPARE(QApplication::focusWidget()->objectName(), order.front());
+        for (int i = 1; i < order.size(); ++i) {
             QTest::keyClick(QApplication::focusWidget(), Qt::Key_Tab);
-            QCOMPARE(QApplication::focusWidget()->objectName(), expected[i]);
+            QCOMPARE(QApplication::focusWidget()->objectName(), order[i]);
         }
-        // Escape is no cancel key here.
-        QTest::keyClick(QApplication::focusWidget(), Qt::Key_Escape);
-        QVERIFY(shared().frmImportarQuotas && shared().frmImportarQuotas->isVisible());
+        QTest::keyClick(QApplication::focusWidget(), Qt::Key_Escape);  // no cancel key
+        QVERIFY(shared().frmImportarQuotas);
     }
 
-    void theCheckBoxSetsTheAmountNotation()
+    void theCheckBoxSetsTheAmountNotationUntilClosed()
     {
         open();
-        QCheckBox* box = child<QCheckBox>("Check1");
-        QTest::mouseClick(box, Qt::LeftButton);
+        click("Check1");
         QVERIFY(shared().SemSeparadorDecimal);
-        QTest::mouseClick(box, Qt::LeftButton);
+        click("Check1");
         QVERIFY(!shared().SemSeparadorDecimal);
-        QTest::mouseClick(box, Qt::LeftButton);
-        QVERIFY(shared().SemSeparadorDecimal);
-        // Closing and opening again starts checked.
+        click("Check1");
         shared().frmImportarQuotas->close();
-        QTRY_VERIFY(!shared().frmImportarQuotas);
+        QTRY_VERIFY(!shared().frmImportarQuotas);  // unloaded
         open();
         QVERIFY(child<QCheckBox>("Check1")->isChecked());
         QVERIFY(!shared().SemSeparadorDecimal);
-    }
-
-    void monthNamesMapExactly_data()
-    {
-        QTest::addColumn<QString>("name");
-        QTest::addColumn<int>("month");
-        QTest::newRow("Janeiro") << "Janeiro" << 1;
-        QTest::newRow("Março") << "Março" << 3;
-        QTest::newRow("Dezembro") << "Dezembro" << 12;
-        QTest::newRow("março") << "março" << 0;
-        QTest::newRow("Marco") << "Marco" << 0;
-        QTest::newRow("empty") << "" << 0;
-    }
-    void monthNamesMapExactly()
-    {
-        QFETCH(QString, name);
-        QFETCH(int, month);
-        QCOMPARE(FrmImportarQuotas::monthFromName(name), month);
     }
 
     void executarRunsOnTheSelectionAndCloses_data()
@@ -191,49 +131,41 @@ private slots:
         QTest::addColumn<QString>("year");
         QTest::addColumn<QString>("month");
         QTest::addColumn<QString>("type");
+        QTest::addColumn<QByteArray>("amount");  // with the box cleared when it has no point
         QTest::addColumn<QString>("message");
-        QTest::newRow("February 2003") << "2003" << "Fevereiro" << "Sindicato"
-                                       << "Não foram processados os registos de quotas referente a 2 / 2003.";
-        QTest::newRow("a month name in other case") << "2004" << "março" << "Sindicato"
-                                                    << "Não foram processados os registos de quotas referente a 0 / 2004.";
-        QTest::newRow("health plan, March 2004") << "2004" << "Março" << "Plano de Saúde" << "";
+        QTest::addColumn<int>("paid");
+        const QString none = QStringLiteral("Não foram processados os registos de quotas referente a %1.");
+        QTest::newRow("February 2003") << "2003" << "Fevereiro" << "Plano de Saúde" << QByteArray("5.00") << none.arg("2 / 2003") << 0;
+        QTest::newRow("a month name in other case") << "2004" << "março" << "Plano de Saúde" << QByteArray("5.00")
+                                                    << none.arg("0 / 2004") << 0;
+        QTest::newRow("union due, March 2004") << "2004" << "Março" << "Sindicato" << QByteArray("5.00") << none.arg("3 / 2004") << 0;
+        QTest::newRow("health plan, March 2004") << "2004" << "Março" << "Plano de Saúde" << QByteArray("5.00") << QString() << 500;
+        QTest::newRow("whole cents") << "2004" << "Março" << "Plano de Saúde" << QByteArray("500") << QString() << 500;
     }
     void executarRunsOnTheSelectionAndCloses()
     {
         QFETCH(QString, year);
         QFETCH(QString, month);
         QFETCH(QString, type);
+        QFETCH(QByteArray, amount);
         QFETCH(QString, message);
+        QFETCH(int, paid);
         f->charged(1, QStringLiteral("100"), 20.0, 0.0, 2);  // a health-plan due only
-        f->useFile("no_tap;quota\n100;5.00\n");
+        f->useFile("no_tap;quota\n100;" + amount + "\n");
         open();
         if (month == QStringLiteral("março"))
-            child<QListWidget>("List2")->currentItem()->setText(month);
+            child("List2")->currentItem()->setText(month);
         else
             select("List2", month);
         select("List1", year);
         select("List3", type);
+        if (!amount.contains('.'))
+            click("Check1");
         ScriptedBoxes boxes;
-        executar();
+        click("Command1");
+        QTRY_VERIFY(!shared().frmImportarQuotas);  // closed after the run
         QCOMPARE(boxes.texts(), message.isEmpty() ? QStringList() : QStringList{message});
-        QCOMPARE(f->cents(f->movementValue(1, QStringLiteral("pago"), 2)), message.isEmpty() ? 500 : 0);
-    }
-
-    void theNextOpeningReadsDecimalPointsAgain()
-    {
-        f->charged(1, QStringLiteral("100"), 20.0);
-        f->charged(2, QStringLiteral("200"), 20.0);
-        f->useFile("no_tap;quota\n100;1250\n");
-        open();
-        QTest::mouseClick(child<QCheckBox>("Check1"), Qt::LeftButton);
-        ScriptedBoxes boxes;
-        executar();
-        QCOMPARE(f->cents(f->movementValue(1, QStringLiteral("pago"))), 1250);
-        f->useFile("no_tap;quota\n200;12.50\n");
-        open();
-        executar();
-        QCOMPARE(f->cents(f->movementValue(2, QStringLiteral("pago"))), 1250);
-        QVERIFY(boxes.shown.isEmpty());
+        QCOMPARE(f->movementCents(1, "pago", 2), paid);
     }
 
     void aFileThatCannotBeReadIsToldAndImportsNothing()
@@ -242,12 +174,12 @@ private slots:
         const QString path = f->useFile("no_tap;quota\n100;\"5\n");
         open();
         ScriptedBoxes boxes;
-        executar();
-        QCOMPARE(boxes.shown.size(), 1);
+        click("Command1");
+        QTRY_VERIFY(!shared().frmImportarQuotas);
+        QCOMPARE(boxes.texts(), QStringList{QStringLiteral("O ficheiro \"%1\" não é um ficheiro CSV válido: um valor entre "
+                                                           "aspas começado na linha 2 não foi fechado.").arg(path)});
         QCOMPARE(boxes.last().icon, Icon::Critical);
-        QCOMPARE(boxes.last().text, QStringLiteral("O ficheiro \"%1\" não é um ficheiro CSV válido: um valor entre aspas "
-                                                   "começado na linha 2 não foi fechado.").arg(path));
-        QCOMPARE(f->cents(f->movementValue(1, QStringLiteral("pago"))), 0);
+        QCOMPARE(f->movementCents(1, "pago"), 0);
     }
 
     void cancelarClosesWithoutImporting()
@@ -258,11 +190,9 @@ private slots:
             return std::make_unique<CsvImportSource>([] { return QString(); });
         });
         open();
-        ScriptedBoxes boxes;
-        QTest::mouseClick(child<QPushButton>("Command2"), Qt::LeftButton);
+        click("Command2");
         QTRY_VERIFY(!shared().frmImportarQuotas);
         QCOMPARE(built, 0);
-        QVERIFY(boxes.shown.isEmpty());
     }
 };
 

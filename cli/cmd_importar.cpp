@@ -1,10 +1,70 @@
 #include "cli/commands.h"
+#include "cli/options.h"
+#include "component/shared_objects.h"
+#include "import/csv_import_source.h"
+#include "import/processar_importacao.h"
+#include "import/rejects_listing.h"
+#include "platform/components.h"
+
+#include <QFileInfo>
+#include <cstdio>
 
 namespace quotas::cli {
 
-int importar(const QStringList&)
+int importar(const QStringList& args)
 {
-    throw QuotasError(QStringLiteral("o comando \"importar\" ainda não está disponível nesta versão."));
+    const Options options(
+        QStringLiteral("importar"),
+        {{QStringLiteral("ano"), QStringLiteral("Ano das quotas."), QStringLiteral("A")},
+         {QStringLiteral("mes"), QStringLiteral("Mês das quotas (1 a 12)."), QStringLiteral("M")},
+         {QStringLiteral("tipo"), QStringLiteral("1 Sindicato, 2 Plano de Saúde."), QStringLiteral("T")},
+         {QStringLiteral("sem-separador"), QStringLiteral("Os valores são cêntimos, sem ponto decimal.")},
+         {QStringLiteral("pdf"), QStringLiteral("Escreve aqui a listagem dos registos não importados."), QStringLiteral("SAIDA")}},
+        args, 1);
+    const int year = options.number(QStringLiteral("ano"), 1000, 9999);
+    const int month = options.number(QStringLiteral("mes"), 1, 12);
+    const int tipo = options.number(QStringLiteral("tipo"), 1, 2);
+    const QString file = options.positional().front();
+    const QString pdf = options.isSet(QStringLiteral("pdf")) ? QFileInfo(options.value(QStringLiteral("pdf"))).absoluteFilePath()
+                                                              : QString();
+    connectOrFail();
+
+    shared().SemSeparadorDecimal = options.isSet(QStringLiteral("sem-separador"));
+    registerComponent(QStringLiteral("Dorvanta.General"),
+                      [file] { return std::make_unique<CsvImportSource>(CsvImportSource::fixedFile(file)); });
+    // Headless there is no preview: the listing goes to the PDF when one was
+    // asked for, and is otherwise left in extras for "quotas rejeitados".
+    QString listingFailure;
+    bool listingWritten = false;
+    setRejectsListing([&] {
+        if (pdf.isEmpty())
+            return;
+        try {
+            writeRejectsListingPdf(pdf);
+            listingWritten = true;
+        } catch (const QuotasError& e) {
+            listingFailure = e.message();
+        }
+    });
+    ImportSummary summary;
+    try {
+        summary = ProcessarImportacao(month, year, tipo);
+    } catch (...) {
+        setRejectsListing({});
+        throw;
+    }
+    setRejectsListing({});
+
+    if (!summary.extrasSaved)
+        throw QuotasError(QStringLiteral("os registos não importados não foram gravados na tabela extras."));
+    if (!listingFailure.isEmpty())
+        throw QuotasError(QStringLiteral("a importação foi feita, mas a listagem dos registos não importados não foi "
+                                         "escrita em %1: %2")
+                              .arg(pdf, listingFailure));
+    if (listingWritten)
+        std::fputs(QStringLiteral("Listagem dos registos não importados escrita em %1.\n").arg(pdf).toUtf8().constData(),
+                   stdout);
+    return 0;
 }
 
 }  // namespace quotas::cli

@@ -1,0 +1,165 @@
+#include "import/frm_importar_quotas.h"
+
+#include "component/shared_objects.h"
+#include "import/processar_importacao.h"
+#include "platform/errors.h"
+#include "platform/message_boxes.h"
+
+#include <QCheckBox>
+#include <QCloseEvent>
+#include <QKeyEvent>
+#include <QLabel>
+#include <QListWidget>
+#include <QPushButton>
+
+namespace quotas {
+
+namespace {
+
+// Positions are kept as laid out in twips, at 15 twips to the pixel (96 DPI).
+QRect twips(int left, int top, int width, int height)
+{
+    return QRect(left / 15, top / 15, width / 15, height / 15);
+}
+
+QDate& pinnedToday()
+{
+    static QDate date;
+    return date;
+}
+
+template <typename W>
+W* place(W* widget, const QString& name, const QRect& geometry)
+{
+    widget->setObjectName(name);
+    widget->setGeometry(geometry);
+    return widget;
+}
+
+}  // namespace
+
+const QStringList& FrmImportarQuotas::monthNames()
+{
+    static const QStringList names = {QStringLiteral("Janeiro"), QStringLiteral("Fevereiro"), QStringLiteral("Março"),
+                                      QStringLiteral("Abril"),   QStringLiteral("Maio"),      QStringLiteral("Junho"),
+                                      QStringLiteral("Julho"),   QStringLiteral("Agosto"),    QStringLiteral("Setembro"),
+                                      QStringLiteral("Outubro"), QStringLiteral("Novembro"),  QStringLiteral("Dezembro")};
+    return names;
+}
+
+int FrmImportarQuotas::monthFromName(const QString& name)
+{
+    return int(monthNames().indexOf(name)) + 1;  // indexOf compares exactly; -1 gives 0
+}
+
+void FrmImportarQuotas::pinToday(const QDate& date)
+{
+    pinnedToday() = date;
+}
+
+QDate FrmImportarQuotas::today()
+{
+    return pinnedToday().isValid() ? pinnedToday() : QDate::currentDate();
+}
+
+FrmImportarQuotas::FrmImportarQuotas(QWidget* owner)
+    : QDialog(owner, Qt::Dialog | Qt::MSWindowsFixedSizeDialogHint | Qt::CustomizeWindowHint | Qt::WindowTitleHint
+                         | Qt::WindowCloseButtonHint),
+      Label3(place(new QLabel(QStringLiteral("Ano de Importação:"), this), QStringLiteral("Label3"), twips(180, 180, 1755, 255))),
+      List1(place(new QListWidget(this), QStringLiteral("List1"), twips(180, 480, 1815, 2595))),
+      Label2(place(new QLabel(QStringLiteral("Mês de Importação:"), this), QStringLiteral("Label2"), twips(2580, 180, 1755, 255))),
+      List2(place(new QListWidget(this), QStringLiteral("List2"), twips(2580, 480, 1815, 2595))),
+      Command1(place(new QPushButton(QStringLiteral("&Executar"), this), QStringLiteral("Command1"), twips(5160, 180, 1575, 375))),
+      Command2(place(new QPushButton(QStringLiteral("&Cancelar"), this), QStringLiteral("Command2"), twips(5160, 600, 1575, 375))),
+      Label1(place(new QLabel(QStringLiteral("Referente a:"), this), QStringLiteral("Label1"), twips(4920, 1440, 1755, 255))),
+      List3(place(new QListWidget(this), QStringLiteral("List3"), twips(4920, 1680, 1815, 1425))),
+      Check1(place(new QCheckBox(QStringLiteral("Os registos estão separados com um ponto (.)"), this),
+                   QStringLiteral("Check1"), twips(180, 3330, 6585, 285)))
+{
+    setObjectName(QStringLiteral("frmImportarQuotas"));
+    setWindowTitle(QStringLiteral("Importar Registos de Quotas"));
+    setAttribute(Qt::WA_DeleteOnClose);
+    setFixedSize(twips(0, 0, 6945, 3795).size());
+    setSizeGripEnabled(false);
+
+    // Neither button answers Enter by itself.
+    for (QPushButton* button : {Command1, Command2}) {
+        button->setAutoDefault(false);
+        button->setDefault(false);
+    }
+    setTabOrder(List2, List1);
+    setTabOrder(List1, Command2);
+    setTabOrder(Command2, Command1);
+    setTabOrder(Command1, List3);
+    setTabOrder(List3, Check1);
+
+    // The box opens checked: the amounts carry a decimal point.
+    Check1->setChecked(true);
+    shared().SemSeparadorDecimal = false;
+    connect(Check1, &QCheckBox::toggled, this, [](bool checked) { shared().SemSeparadorDecimal = !checked; });
+
+    const QDate now = today();
+    for (int year = 1999; year <= now.year() + 1; ++year)
+        List1->addItem(QString::number(year));
+    const auto years = List1->findItems(QString::number(now.year()), Qt::MatchExactly);
+    if (!years.isEmpty())
+        List1->setCurrentItem(years.front());
+    List2->addItems(monthNames());
+    List2->setCurrentRow(now.month() - 1);
+    List3->addItems({QStringLiteral("Sindicato"), QStringLiteral("Plano de Saúde")});
+    List3->setCurrentRow(0);
+    for (QListWidget* list : {List1, List2, List3}) {
+        list->setSelectionMode(QAbstractItemView::SingleSelection);
+        if (list->currentItem())
+            list->scrollToItem(list->currentItem());
+    }
+
+    connect(Command1, &QPushButton::clicked, this, &FrmImportarQuotas::executar);
+    connect(Command2, &QPushButton::clicked, this, &QWidget::close);
+    List2->setFocus();
+}
+
+void FrmImportarQuotas::executar()
+{
+    if (m_running)
+        return;
+    m_running = true;
+    const auto selected = [](QListWidget* list) { return list->currentItem() ? list->currentItem()->text() : QString(); };
+    const int month = monthFromName(selected(List2));
+    const int tipo = selected(List3) == QLatin1String("Sindicato") ? 1 : 2;
+    const int year = selected(List1).toInt();
+    // Nothing may escape into the event loop: what the run does not tell the
+    // user itself (a file that cannot be read, say) is told here.
+    try {
+        ProcessarImportacao(month, year, tipo);
+    } catch (const QuotasError& e) {
+        msgBox(e.message(), Buttons::Ok, Icon::Critical);
+    } catch (const std::exception& e) {
+        msgBox(QString::fromLocal8Bit(e.what()), Buttons::Ok, Icon::Critical);
+    }
+    m_running = false;
+    close();
+}
+
+void FrmImportarQuotas::keyPressEvent(QKeyEvent* event)
+{
+    // The dialog has no cancel button: Escape does not close it.
+    if (event->key() == Qt::Key_Escape) {
+        event->accept();
+        return;
+    }
+    QDialog::keyPressEvent(event);
+}
+
+void FrmImportarQuotas::closeEvent(QCloseEvent* event)
+{
+    // Deleting the dialog under its own running import would pull the
+    // ground from under it; it closes itself when the run returns.
+    if (m_running) {
+        event->ignore();
+        return;
+    }
+    QDialog::closeEvent(event);
+}
+
+}  // namespace quotas

@@ -1,0 +1,357 @@
+#include "import/processar_importacao.h"
+
+#include "component/money.h"
+#include "component/shared_objects.h"
+#include "generation/substituir_caracter.h"
+#include "import/import_recordset.h"
+#include "import/rejects_listing.h"
+#include "platform/components.h"
+#include "platform/errors.h"
+#include "platform/late_binding.h"
+#include "platform/message_boxes.h"
+#include "platform/recordset.h"
+#include "platform/transaction.h"
+
+#include <QLocale>
+#include <QStringList>
+#include <cmath>
+#include <memory>
+#include <optional>
+
+namespace quotas {
+
+namespace {
+
+// The rejects list keeps at most this many values of a line.
+constexpr int kRejectColumns = 21;
+
+RejectsListing& listingInUse()
+{
+    thread_local RejectsListing listing;
+    return listing;
+}
+
+// The run must go on whatever the progress display does.
+class Progress {
+public:
+    Progress()
+    {
+        try {
+            m_display = createComponent(QStringLiteral("Velumo.General"));
+        } catch (const QuotasError&) {
+        }
+    }
+    void call(const char* method, const QVariantList& args = {})
+    {
+        try {
+            if (m_display)
+                callByName(m_display.get(), method, args);
+        } catch (const QuotasError&) {
+        }
+    }
+    void release()
+    {
+        call("terminar");
+        m_display.reset();
+    }
+
+private:
+    std::unique_ptr<QObject> m_display;
+};
+
+qint64 cents(double amount)
+{
+    return std::llround(amount * 100.0);
+}
+
+// A stored amount; Null counts as 0, as it does once the maintenance has run.
+double amountOf(const QVariant& value)
+{
+    return value.isNull() ? 0.0 : value.toDouble();
+}
+
+// An imported amount: "." and "," both read as the decimal separator, whole
+// cents when the source carries no separator. Nothing when the value is not
+// a number.
+std::optional<double> readAmount(const QVariant& value, bool wholeCents)
+{
+    if (!value.isValid() || value.isNull())
+        return std::nullopt;
+    static const QLocale comma = [] {
+        QLocale l(QLocale::Portuguese, QLocale::Portugal);
+        l.setNumberOptions(QLocale::RejectGroupSeparator);
+        return l;
+    }();
+    const std::optional<double> number = parseDecimal(SubstituirCaracter(value, QStringLiteral("."), QStringLiteral(",")), comma);
+    if (!number)
+        return std::nullopt;
+    return roundCents(wholeCents ? *number / 100.0 : *number);
+}
+
+enum class Outcome { Posted, LeftAlone, Rejected };
+
+// The run's state for the lines.
+struct Lines {
+    Recordset& source;
+    Recordset& movements;
+    Recordset& accounts;
+    Connection& connection;
+    int quotaColumn;
+    int rend1Column;  // -1 when the source has none
+    bool wholeCents;
+    int month;
+    int year;
+    int tipo;
+
+    Outcome process()
+    {
+        const QVariant key = source.value(0);
+        movements.moveFirst();
+        if (key.isNull() || !movements.find(QStringLiteral("no_tap"), key.toString()))
+            return Outcome::Rejected;
+        // The account of the member whose movement was found, so that a staff
+        // number two members share can never split one line between them.
+        accounts.moveFirst();
+        if (!accounts.find(QStringLiteral("socio_id"), movements.value(QStringLiteral("socio_id"))))
+            return Outcome::Rejected;
+
+        const std::optional<double> q = readAmount(source.value(quotaColumn), wholeCents);
+        std::optional<double> r;
+        if (rend1Column >= 0)
+            r = readAmount(source.value(rend1Column), wholeCents);
+        if (!q || (rend1Column >= 0 && !r))
+            return Outcome::Rejected;
+
+        const double charged = amountOf(movements.value(QStringLiteral("quota")));
+        const bool unpaid = cents(amountOf(movements.value(QStringLiteral("pago")))) == 0;
+        if (!((unpaid && cents(*q) != 0) || cents(*q) > cents(charged)))
+            return Outcome::LeftAlone;
+
+        movements.setValue(QStringLiteral("rend1"), r ? QVariant(*r) : accounts.value(QStringLiteral("ult_rend1")));
+        movements.setValue(QStringLiteral("rend2"), 0.0);
+        movements.setValue(QStringLiteral("pago"), *q);
+        if (cents(charged) > 0)
+            accounts.addTo(QStringLiteral("total_quotas"), -charged);
+        movements.setValue(QStringLiteral("quota"), *q);
+
+        if (r) {
+            accounts.setValue(QStringLiteral("ult_rend1"), *r);
+            accounts.setValue(QStringLiteral("ult_rend2"), 0.0);
+        }
+        const double base = amountOf(accounts.value(QStringLiteral("ult_rend1")))
+                            + amountOf(accounts.value(QStringLiteral("ult_rend2")));
+        const QString due = tipo == 1 ? QStringLiteral("ult_quota_sindicato") : QStringLiteral("ult_quota_seguro");
+        const QString rate = tipo == 1 ? QStringLiteral("ult_perc_sindicato") : QStringLiteral("ult_perc_seguro");
+        accounts.setValue(due, *q);
+        // Without remunerations there is no rate to learn: the last one stays.
+        if (base != 0)
+            accounts.setValue(rate, *q / base);
+        accounts.setValue(QStringLiteral("ult_ano"), year);
+        accounts.setValue(QStringLiteral("ult_mes"), month);
+        accounts.addTo(QStringLiteral("total_quotas"), *q);
+        accounts.addTo(QStringLiteral("total_pago"), *q);
+
+        // The totals are written as "total + amount", so a payment another
+        // user records on the account meanwhile is kept.
+        Transaction line(connection);
+        movements.update();
+        accounts.update();
+        line.commit();
+        return Outcome::Posted;
+    }
+
+    // After a rollback the sets hold values the database no longer has.
+    void resynchronise()
+    {
+        movements.cancelUpdate();
+        accounts.cancelUpdate();
+        try {
+            movements.requery();
+            accounts.requery();
+        } catch (const QuotasError&) {
+            // Left closed: the following lines fail and are listed too.
+        }
+    }
+};
+
+void copyToRejects(Recordset& rejects, Recordset& source)
+{
+    rejects.addNew();
+    const int n = std::min(source.fieldCount(), kRejectColumns);
+    for (int i = 0; i < n; ++i) {
+        const QVariant value = source.value(i);
+        if (!value.isNull())  // a value without text form leaves its column empty
+            rejects.setValue(i, value.toString());
+    }
+    rejects.update();
+}
+
+// extras holds the rejects of the last run that had any: all of them or,
+// when the rewrite fails, still those of the run before.
+void rewriteExtras(Connection& connection, Recordset& rejects)
+{
+    Transaction tx(connection);
+    connection.execute(QStringLiteral("DELETE FROM extras"));
+    Recordset extras;
+    extras.open(QStringLiteral("Select * from extras where 1 = 0"), connection, Cursor::Dynamic, Lock::Optimistic);
+    const int columns = extras.fieldCount();
+    for (rejects.moveFirst(); !rejects.eof(); rejects.moveNext()) {
+        extras.addNew();
+        for (int c = 1; c < columns && c - 1 < kRejectColumns; ++c) {
+            const QVariant value = rejects.value(c - 1);
+            if (!value.isNull())
+                extras.setValue(c, value);
+        }
+        extras.update();
+    }
+    tx.commit();
+}
+
+void showListing()
+{
+    Connection& prints = Data().SqlServer_Prints;
+    if (!prints.isOpen())
+        prints.open();
+    try {
+        const RejectsListing& listing = listingInUse();
+        if (listing)
+            listing();
+        else
+            showRejectsListing();
+    } catch (...) {
+        prints.close();
+        throw;
+    }
+    prints.close();
+}
+
+QStringList rejectColumns()
+{
+    QStringList names;
+    for (int i = 0; i < kRejectColumns; ++i)
+        names << QStringLiteral("Field%1").arg(i);
+    return names;
+}
+
+}  // namespace
+
+RejectsListing setRejectsListing(RejectsListing listing)
+{
+    RejectsListing previous = std::move(listingInUse());
+    listingInUse() = std::move(listing);
+    return previous;
+}
+
+ImportSummary ProcessarImportacao(int month, int year, int tipo)
+{
+    ImportSummary summary;
+    std::unique_ptr<QObject> component = createComponent(QStringLiteral("Dorvanta.General"));
+    const QVariant built = callByName(component.get(), "build");
+
+    auto* set = qobject_cast<ImportRecordset*>(built.value<QObject*>());
+    if (!set || !set->rows().isOpen())
+        return summary;
+    Recordset& source = set->rows();
+    if (source.eof()) {
+        msgBox(QStringLiteral("Não foram indicados registos para importar."), Buttons::Ok, Icon::Information);
+        return summary;
+    }
+
+    // Names are compared exactly: "Quota" is not "quota".
+    int noTapColumn = -1;
+    int quotaColumn = -1;
+    int rend1Column = -1;
+    for (int i = 0; i < source.fieldCount(); ++i) {
+        const QString name = source.fieldName(i);
+        if (name == QLatin1String("no_tap") && noTapColumn < 0)
+            noTapColumn = i;
+        else if (name == QLatin1String("quota") && quotaColumn < 0)
+            quotaColumn = i;
+        else if (name == QLatin1String("rend1") && rend1Column < 0)
+            rend1Column = i;
+    }
+    if (noTapColumn < 0 || quotaColumn < 0) {
+        msgBox(QStringLiteral("Não foram especificados os campos no_tap ou quota."), Buttons::Ok, Icon::Information);
+        return summary;
+    }
+
+    source.moveLast();
+    source.moveFirst();
+    Progress progress;
+    progress.call("Iniciar", {source.recordCount(), QStringLiteral("Transferindo dados, aguarde uns momentos . . .")});
+
+    Connection& connection = Data().SqlServer;
+    Recordset movements;
+    Recordset accounts;
+    try {
+        movements.open(QStringLiteral("Select tbSocios.no_tap,tbQuotas_Movimentos.* from tbQuotas_Movimentos left outer "
+                                      "join tbsocios on tbQuotas_Movimentos.socio_id = tbSocios.socio_id where (ano=? "
+                                      "and mes=? and tipo=?)"),
+                       connection, Cursor::Keyset, Lock::Pessimistic, {year, month, tipo});
+        accounts.open(QStringLiteral("Select tbSocios.no_tap,tbQuotas_Socios.* from tbQuotas_Socios left outer join "
+                                     "tbsocios on tbQuotas_Socios.socio_id = tbSocios.socio_id"),
+                      connection, Cursor::Keyset, Lock::Pessimistic);
+    } catch (const QuotasError& e) {
+        component.reset();
+        progress.release();
+        msgBox(QStringLiteral("Não foi possível ler os registos de quotas: %1").arg(e.message()), Buttons::Ok,
+               Icon::Critical);
+        return summary;
+    }
+
+    Recordset rejects;
+    rejects.openInMemory(rejectColumns());
+    if (movements.eof()) {
+        msgBox(QStringLiteral("Não foram processados os registos de quotas referente a %1 / %2.").arg(month).arg(year));
+    } else {
+        Lines lines{source,      movements,   accounts, connection, quotaColumn,
+                    rend1Column, shared().SemSeparadorDecimal, month, year, tipo};
+        while (!source.eof()) {
+            ++summary.lines;
+            Outcome outcome = Outcome::Rejected;
+            try {
+                outcome = lines.process();
+            } catch (const QuotasError&) {
+                ++summary.failed;
+                lines.resynchronise();
+            }
+            if (outcome == Outcome::Posted)
+                ++summary.posted;
+            else if (outcome == Outcome::Rejected)
+                copyToRejects(rejects, source);
+            progress.call("setvalor", {1});
+            source.moveNext();
+        }
+    }
+
+    component.reset();  // the source goes with its component
+    movements.close();
+    accounts.close();
+    progress.release();
+
+    summary.rejected = rejects.recordCount();
+    if (summary.rejected == 0)
+        return summary;
+    msgBox(QStringLiteral("Durante o processo de importação de dados não foram registados %1 associados.")
+               .arg(summary.rejected),
+           Buttons::Ok, Icon::Critical);
+    try {
+        rewriteExtras(connection, rejects);
+    } catch (const QuotasError& e) {
+        summary.extrasSaved = false;
+        msgBox(QStringLiteral("Não foi possível gravar os registos não importados na tabela extras, que ficou como "
+                              "estava: %1")
+                   .arg(e.message()),
+               Buttons::Ok, Icon::Critical);
+        return summary;
+    }
+    try {
+        showListing();
+    } catch (const QuotasError& e) {
+        msgBox(QStringLiteral("Não foi possível mostrar a listagem dos registos não importados: %1").arg(e.message()),
+               Buttons::Ok, Icon::Exclamation);
+    }
+    return summary;
+}
+
+}  // namespace quotas

@@ -1,0 +1,42 @@
+#pragma once
+
+#include <functional>
+
+namespace quotas {
+
+// What a run did, for the command line and the tests; the user learns it
+// from the run's own messages.
+struct ImportSummary {
+    int lines = 0;           // source lines visited
+    int posted = 0;          // lines whose deduction was posted
+    int rejected = 0;        // lines listed in extras (failed ones included)
+    int failed = 0;          // matched lines whose writes were rolled back
+    bool extrasSaved = true; // false when extras could not be rewritten
+};
+
+// Posts the employer's list of deductions, obtained from the import source
+// "Dorvanta.General", against the dues charged for month, year and tipo
+// (1 the union due, anything else the insurance due), on Data().SqlServer.
+//
+// - Lines are matched by their first value to the members' no_tap, exactly
+//   and through indexes built once per run; no value from the file reaches
+//   SQL text. A line is posted when the movement is unpaid and the
+//   deduction is not 0, or when the deduction exceeds the charge; the
+//   movement's and the account's writes of a line commit together.
+// - Lines without a movement or an account, with an amount that cannot be
+//   read, or whose writes failed are rejected: counted in the final message,
+//   written to extras (rewritten in one transaction) and listed.
+// - Amounts are read with "." or "," as decimal separator, divided by 100
+//   when shared().SemSeparadorDecimal is set, and kept in whole cents.
+// - The source's failures (no file readable, say) pass to the caller as
+//   QuotasError before anything is changed.
+ImportSummary ProcessarImportacao(int month, int year, int tipo);
+
+// What the run does to show the rejects listing, after extras has been
+// rewritten, with SqlServer_Prints open: showRejectsListing() unless
+// replaced (the command line writes a PDF instead; the tests record the
+// call). Returns the one it replaces; an empty function restores the preview.
+using RejectsListing = std::function<void()>;
+RejectsListing setRejectsListing(RejectsListing listing);
+
+}  // namespace quotas

@@ -114,50 +114,28 @@ private slots:
     }
     void cleanup() { qunsetenv("QUOTAS_DATA_DIR"); }
 
-    void opensIdleWithTheLayoutInTwips_data()
+    void opensIdle()
     {
-        QTest::addColumn<QString>("name");
-        QTest::addColumn<QString>("text");
-        QTest::addColumn<QRect>("twips");
-        QTest::newRow("Label7") << "Label7" << "" << QRect(60, 60, 7515, 375);
-        QTest::newRow("Label6") << "Label6" << "Procedimentos de Manutenção da Base de Dados" << QRect(120, 120, 7335, 255);
-        QTest::newRow("Animation1") << "Animation1" << "" << QRect(240, 480, 1215, 555);
-        QTest::newRow("Label1") << "Label1" << "Movimentos Activos:" << QRect(780, 1380, 2655, 195);
-        QTest::newRow("bar 1") << "ProgressBar1" << "" << QRect(780, 1620, 4635, 195);
-        QTest::newRow("Label2") << "Label2" << "Movimentos Inactivos:" << QRect(780, 1920, 2655, 195);
-        QTest::newRow("bar 2") << "ProgressBar2" << "" << QRect(780, 2160, 4635, 195);
-        QTest::newRow("Label3") << "Label3" << "Histórico de Movimentos:" << QRect(780, 2460, 2655, 195);
-        QTest::newRow("bar 3") << "ProgressBar3" << "" << QRect(780, 2700, 4635, 195);
-        QTest::newRow("Label4") << "Label4" << "Acumulados Activos:" << QRect(780, 3000, 2655, 195);
-        QTest::newRow("bar 4") << "ProgressBar4" << "" << QRect(780, 3240, 4635, 195);
-        QTest::newRow("Label5") << "Label5" << "Acumulados Inactivos:" << QRect(780, 3540, 2655, 195);
-        QTest::newRow("bar 5") << "ProgressBar5" << "" << QRect(780, 3780, 4635, 195);
-        QTest::newRow("Command1") << "Command1" << "&Iniciar" << QRect(5760, 3300, 1815, 375);
-        QTest::newRow("Command2") << "Command2" << "&Sair" << QRect(5760, 3780, 1815, 375);
-    }
-
-    void opensIdleWithTheLayoutInTwips()
-    {
-        QFETCH(QString, name);
-        QFETCH(QString, text);
-        QFETCH(QRect, twips);
         FrmManutencaoDados d;
         d.show();
         QCOMPARE(d.windowTitle(), QStringLiteral("Manutenção da Base de Dados"));
-        QCOMPARE(d.size(), QSize(515, 286));
-        auto* w = d.findChild<QWidget*>(name);
-        QVERIFY(w);
-        QVERIFY(w->isVisible());
-        QCOMPARE(w->geometry(), QRect(twips.x() / 15, twips.y() / 15, twips.width() / 15, twips.height() / 15));
-        if (auto* label = qobject_cast<QLabel*>(w))
-            QCOMPARE(label->text(), text);
-        if (auto* button = qobject_cast<QPushButton*>(w))
-            QCOMPARE(button->text(), text);
-        if (auto* bar = qobject_cast<QProgressBar*>(w)) {
-            QCOMPARE(bar->minimum(), 0);
-            QCOMPARE(bar->maximum(), 100);
-            QCOMPARE(bar->value(), 0);
+        QCOMPARE(d.size(), QSize(7725 / 15, 4290 / 15));
+        const QList<QLabel*> labels = {d.Label1, d.Label2, d.Label3, d.Label4, d.Label5};
+        const QList<QProgressBar*> bars = barsOf(d);
+        for (int i = 0; i < 5; ++i) {
+            QCOMPARE(bars[i]->minimum(), 0);
+            QCOMPARE(bars[i]->maximum(), 100);
+            QCOMPARE(bars[i]->value(), 0);
+            // Each label stands directly above its bar, and the bars follow the passes down.
+            QCOMPARE(labels[i]->x(), bars[i]->x());
+            QVERIFY(labels[i]->geometry().bottom() < bars[i]->y());
+            QVERIFY(i == 0 || bars[i - 1]->geometry().bottom() < labels[i]->y());
         }
+        QCOMPARE(d.Label1->text(), QStringLiteral("Movimentos Activos:"));
+        QCOMPARE(d.Label5->text(), QStringLiteral("Acumulados Inactivos:"));
+        QVERIFY(d.Command1->isVisible() && d.Command2->isVisible());
+        QCOMPARE(d.Command1->text(), QStringLiteral("&Iniciar"));
+        QCOMPARE(d.Command2->text(), QStringLiteral("&Sair"));
         QVERIFY(!d.Animation1->isPlaying());
     }
 

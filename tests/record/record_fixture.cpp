@@ -5,7 +5,6 @@
 
 #include <QApplication>
 #include <QDate>
-#include <QLineEdit>
 #include <QPointer>
 #include <QTest>
 #include <QTimer>
@@ -94,6 +93,11 @@ bool RecordFixture::open(int socio, const QVariant& pkey, const std::function<vo
 void RecordFixture::tabOut(QWidget* field)
 {
     QTest::keyClick(field, Qt::Key_Tab);
+}
+
+void RecordFixture::click(QPushButton* button)
+{
+    QTest::mouseClick(button, Qt::LeftButton);
 }
 
 void RecordFixture::type(QLineEdit* field, const QString& text)

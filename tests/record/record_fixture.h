@@ -1,8 +1,7 @@
 #pragma once
 
-// What the record window's tests share: members and movements in the test
-// database, the window opened through General::Registo with a script that
-// drives it while it is modal, and host objects that receive RemoteKey.
+// Shared by the record window's tests: rows in the test database, and the
+// window opened through General::Registo with a script run while it is modal.
 
 #include "component/general.h"
 #include "platform/errors.h"
@@ -10,10 +9,9 @@
 #include "support/scripted_boxes.h"
 #include "support/test_database.h"
 
-#include <QObject>
-#include <QVariantList>
+#include <QLineEdit>
+#include <QPushButton>
 #include <functional>
-#include <memory>
 
 namespace quotas::test {
 
@@ -31,31 +29,26 @@ class RecordFixture {
 public:
     explicit RecordFixture(TestDatabase& db) : m_db(db) {}
 
-    // A member of the register (socio_id = id) with staff number and names.
+    // Member `id` ("T<id>", "Maria João Conceição <id>", "Mimi").
     void addMember(int id);
-    // A movement of the member; returns its quota_id.
-    QVariant addMovement(int socio, const MovementRow& row);
-    // A dues account with last values of its own and the given totals.
+    QVariant addMovement(int socio, const MovementRow& row);  // its quota_id
+    // Last values 2001/11, rend 1 and 2, union due 3 (rate 0.5), insurance 4 (0.25).
     void addAccount(int socio, double totalQuotas, double totalPago);
 
-    // One column of one row, read on the test's own connection.
     QVariant movement(const QVariant& quotaId, const QString& column);
     QVariant account(int socio, const QString& column);
     bool hasAccount(int socio);
-
-    // The text the host hands to Registo for a member's movements.
     static QString movementsOf(int socio);
 
-    // Opens the window with General::Registo on the member's movements,
-    // positioned on pkey, and runs script once the window is up and its
-    // computed fields are filled. The window is closed with its close
-    // control if the script leaves it open. False when no window showed.
+    // Registo on the member's movements at pkey; script runs once the window
+    // is up and refreshed, and the close control shuts it if left open.
+    // False when no window showed.
     bool open(int socio, const QVariant& pkey, const std::function<void(FrmQuota&)>& script, QObject* caller = nullptr);
 
-    // Leaves the focused field for the next one, as the Tab key does.
-    static void tabOut(QWidget* field);
-    // Gives a field the focus and types text over what entering selected.
+    // Focus into a field and typing over what entering selected; Tab out.
     static void type(QLineEdit* field, const QString& text);
+    static void tabOut(QWidget* field);
+    static void click(QPushButton* button);
 
     General general;
 
@@ -63,29 +56,17 @@ private:
     TestDatabase& m_db;
 };
 
-// A host object that records the keys it is handed.
 class RecordingCaller : public QObject {
     Q_OBJECT
 public:
     QVariantList keys;
-    Q_INVOKABLE void RemoteKey(const QVariant& key) { keys << key; }
-};
-
-// A host object whose RemoteKey fails.
-class FailingCaller : public QObject {
-    Q_OBJECT
-public:
-    int calls = 0;
-    Q_INVOKABLE void RemoteKey(const QVariant&)
+    bool fail = false;
+    Q_INVOKABLE void RemoteKey(const QVariant& key)
     {
-        ++calls;
-        throw QuotasError(QStringLiteral("falhou"));
+        keys << key;
+        if (fail)
+            throw QuotasError(QStringLiteral("falhou"));
     }
-};
-
-// A host object without RemoteKey.
-class SilentCaller : public QObject {
-    Q_OBJECT
 };
 
 }  // namespace quotas::test

@@ -196,7 +196,7 @@ private slots:
         QFETCH(QString, type);
         QFETCH(QString, other);
         // An older movement than the last: Sair carries its values all the same.
-        const QVariant id = fx->addMovement(1, {500.0, 300.0, 12.0, 1.0, ref, 2002, 7});
+        const QVariant id = fx->addMovement(1, {500.0, 300.1, 12.0, 0.1, ref, 2002, 7});
         fx->addMovement(1, {900.0, 0.0, 13.5, 0.0, QStringLiteral("Sindicato"), 2003, 1});
         if (hadAccount)
             fx->addAccount(1, 100.0, 40.0);
@@ -207,11 +207,11 @@ private slots:
         }));
         auto account = [&](const QString& column) { return fx->account(1, column).toDouble(); };
         QCOMPARE(fx->movement(id, QStringLiteral("rend1")).toDouble(), 700.0);
-        QCOMPARE(fx->movement(id, QStringLiteral("quota")).toDouble(), 15.0);  // (700 + 300) x 0.015
+        QCOMPARE(fx->movement(id, QStringLiteral("quota")).toDouble(), 15.0);  // (700 + 300.1) x 0.015
         QCOMPARE(account(QStringLiteral("ult_rend1")), 700.0);
-        QCOMPARE(account(QStringLiteral("ult_rend2")), 300.0);
+        QCOMPARE(account(QStringLiteral("ult_rend2")), 300.1);
         QCOMPARE(account(QStringLiteral("ult_quota_") + type), 15.0);
-        QCOMPARE(account(QStringLiteral("ult_perc_") + type), 0.015);
+        QCOMPARE(account(QStringLiteral("ult_perc_") + type), 15.0 / 1000.1);
         QCOMPARE(account(QStringLiteral("ult_ano")), hadAccount ? 2001.0 : 2002.0);
         QCOMPARE(account(QStringLiteral("ult_mes")), hadAccount ? 11.0 : 7.0);
         QCOMPARE(account(QStringLiteral("total_quotas")), hadAccount ? 100.0 : 0.0);

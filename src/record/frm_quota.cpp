@@ -116,6 +116,8 @@ void FrmQuota::showPorLiquidar()
 void FrmQuota::Timer1_Timer()
 {
     Timer1->stop();
+    if (!Adodc1)
+        return;
     const double remunerations = amountOf(Adodc1->value(QStringLiteral("rend1")))
                                  + amountOf(Adodc1->value(QStringLiteral("rend2")));
     Text8->setText(participationText(amountOf(Adodc1->value(QStringLiteral("quota"))), remunerations));

@@ -1,0 +1,29 @@
+#pragma once
+
+#include <QDate>
+#include <QLocale>
+#include <QString>
+#include <QVariant>
+
+namespace quotas {
+
+// "dd-mmm-yyyy" with the Portuguese month abbreviations ("05-fev-2003"); an
+// empty text for Null or an invalid date.
+QString formatDataQuota(const QVariant& date);
+
+// A number as the user types it: the locale's decimal separator, no group
+// separators, no trailing zeros, at most 15 significant digits (so a
+// difference such as 10.10 - 4.05 reads "6.05", not its binary residue).
+QString plainNumber(double value, const QLocale& locale = QLocale());
+
+// The share of the remunerations that a due represents, rounded to 5
+// decimal places half to even; "0" when the remunerations add up to 0.
+QString participationText(double quota, double remunerations, const QLocale& locale = QLocale());
+
+// A column value as the window computes with it: Null counts as 0.
+inline double amountOf(const QVariant& value)
+{
+    return value.isNull() ? 0.0 : value.toDouble();
+}
+
+}  // namespace quotas

@@ -1,10 +1,13 @@
 #include "generation/lancar_quota.h"
 
 #include "component/money.h"
+#include "generation/dues_account.h"
 #include "generation/dues_counter.h"
 #include "generation/generation_outcome.h"
 #include "platform/connection.h"
 #include "platform/recordset.h"
+
+#include <QSqlQuery>
 
 namespace quotas {
 
@@ -22,21 +25,29 @@ void noteOnce(QStringList& members, const QString& label)
 QString memberLabel(const Recordset& member)
 {
     const QString noTap = member.value(QStringLiteral("no_tap")).toString().trimmed();
-    return noTap.isEmpty() ? QStringLiteral("sem número (associado %1)").arg(member.value(QStringLiteral("no")).toLongLong()) : noTap;
+    return noTap.isEmpty() ? QStringLiteral("sem número (associado %1)").arg(member.value(QStringLiteral("no")).toLongLong())
+                           : noTap;
+}
+
+unsigned chargedTypes(Connection& connection, const QVariant& socio, int ano, int mes)
+{
+    QSqlQuery& q = connection.run(connection.dialect().translate(QStringLiteral(
+                                      "SELECT tipo FROM tbQuotas_Movimentos WHERE (socio_id=?) AND (ano= ?) AND (mes= ?)")),
+                                  {socio, ano, mes});
+    unsigned charged = 0;
+    while (q.next()) {
+        const int tipo = q.value(0).toInt();
+        if (tipo > 0 && tipo < 32)
+            charged |= 1u << tipo;
+    }
+    q.finish();
+    return charged;
 }
 
 bool LancarQuota(PostingContext& ctx, DueType type)
 {
     const DueTypeInfo& info = dueTypeInfo(type);
-    const QVariant no = ctx.member.value(QStringLiteral("no"));
-
-    // The unique index on (socio_id, ano, mes, tipo) answers this at once.
-    ctx.movements.close();
-    ctx.movements.open(QStringLiteral("SELECT * FROM tbQuotas_Movimentos WHERE (socio_id=?) AND (ano= ?) AND (mes= ?) "
-                                      "AND (tipo=%1)")
-                           .arg(info.tipo),
-                       ctx.connection, Cursor::Keyset, Lock::Pessimistic, {no, ctx.ano, ctx.mes});
-    if (!ctx.movements.eof())
+    if (ctx.charged & (1u << info.tipo))
         return false;
 
     if (type == DueType::Seguro
@@ -44,9 +55,7 @@ bool LancarQuota(PostingContext& ctx, DueType type)
                              ctx.member.value(QStringLiteral("seguro_data_rescisao")), ctx.ano, ctx.mes))
         return false;
 
-    const QVariant rend1 = ctx.account.value(QStringLiteral("ult_rend1"));
-    const QVariant rend2 = ctx.account.value(QStringLiteral("ult_rend2"));
-    if (rend1.isNull() || rend2.isNull()) {
+    if (ctx.account.rend1().isNull() || ctx.account.rend2().isNull()) {
         ++ctx.outcome.missingRemuneration;
         noteOnce(ctx.outcome.membersMissingRemuneration, memberLabel(ctx.member));
         return false;
@@ -55,7 +64,7 @@ bool LancarQuota(PostingContext& ctx, DueType type)
     ctx.employers.moveFirst();
     const bool employerFound = ctx.employers.find(QStringLiteral("code"), ctx.member.value(QStringLiteral("empresa")));
     const std::optional<double> rate =
-        dueRate(ctx.account.value(info.personalRate), employerFound,
+        dueRate(ctx.account.personalRate(type), employerFound,
                 employerFound ? ctx.employers.value(QStringLiteral("percent_sindicato")) : QVariant());
     if (!rate) {
         ++ctx.outcome.missingRate;
@@ -63,32 +72,16 @@ bool LancarQuota(PostingContext& ctx, DueType type)
         return false;
     }
 
-    const double r1 = roundCents(rend1.toDouble());
-    const double r2 = roundCents(rend2.toDouble());
-    const double amount = dueAmount(r1, r2, *rate);
+    const double rend1 = roundCents(ctx.account.rend1().toDouble());
+    const double rend2 = roundCents(ctx.account.rend2().toDouble());
+    const double amount = dueAmount(rend1, rend2, *rate);
     const int number = ctx.counter.next();
-
-    Recordset& mv = ctx.movements;
-    mv.addNew();
-    mv.setValue(QStringLiteral("data"), ctx.today);
-    mv.setValue(QStringLiteral("ano"), ctx.ano);
-    mv.setValue(QStringLiteral("mes"), ctx.mes);
-    mv.setValue(QStringLiteral("socio_id"), no);
-    mv.setValue(QStringLiteral("ref"), info.ref);
-    mv.setValue(QStringLiteral("rend1"), r1);
-    mv.setValue(QStringLiteral("rend2"), r2);
-    mv.setValue(QStringLiteral("quota"), amount);
-    mv.setValue(QStringLiteral("pago"), 0.0);
-    mv.setValue(QStringLiteral("tipo"), info.tipo);
-    mv.setValue(QStringLiteral("quota_no"), number);
-    mv.update();
-
-    // A running total: saved as "total + amount", so a payment recorded
-    // meanwhile is kept.
-    ctx.account.addTo(QStringLiteral("total_quotas"), amount);
-    ctx.account.setValue(info.amountColumn, amount);
-    ctx.account.setValue(QStringLiteral("ult_ano"), ctx.ano);
-    ctx.account.setValue(QStringLiteral("ult_mes"), ctx.mes);
+    ctx.connection.execute(QStringLiteral("INSERT INTO tbQuotas_Movimentos (data, ano, mes, socio_id, ref, rend1, rend2, "
+                                          "quota, pago, tipo, quota_no) VALUES (?, ?, ?, ?, ?, ?, ?, ?, 0, ?, ?)"),
+                           {ctx.today, ctx.ano, ctx.mes, ctx.member.value(QStringLiteral("no")), info.ref, rend1, rend2,
+                            amount, info.tipo, number});
+    ctx.account.charge(type, amount, ctx.ano, ctx.mes);
+    ctx.charged |= 1u << info.tipo;
     ++ctx.outcome.posted;
     return true;
 }

@@ -2,6 +2,7 @@
 
 #include "component/money.h"
 #include "component/shared_objects.h"
+#include "generation/dues_account.h"
 #include "generation/dues_counter.h"
 #include "generation/lancar_quota.h"
 #include "platform/components.h"
@@ -62,12 +63,20 @@ public:
     void visit(Recordset& member)
     {
         Transaction tx(m_connection);
-        openAccount(member);
-        PostingContext ctx{m_connection, m_ano,  m_mes,      m_today,   member,
-                           m_account,    m_employers, m_movements, m_counter, m_outcome};
+        const QVariant no = member.value(QStringLiteral("no"));
+        if (member.isNull(QStringLiteral("squota_id")))
+            createAccount(member);
+        if (!m_account.lock(m_connection, no)) {
+            // Deleted since the members were read.
+            createAccount(member);
+            if (!m_account.lock(m_connection, no))
+                throw DbError(QStringLiteral("Não foi possível criar a conta de quotas do associado."));
+        }
+        PostingContext ctx{m_connection, m_ano,     m_mes,     m_today,  member,
+                           m_account,    m_employers, m_counter, m_outcome, chargedTypes(m_connection, no, m_ano, m_mes)};
         LancarQuota(ctx, DueType::Sindicato);
         LancarQuota(ctx, DueType::Seguro);
-        m_account.update();
+        m_account.save(m_connection);
         tx.commit();
         ++m_outcome.members;
     }
@@ -75,25 +84,6 @@ public:
     GenerationOutcome& outcome() { return m_outcome; }
 
 private:
-    void openAccount(Recordset& member)
-    {
-        const QVariant no = member.value(QStringLiteral("no"));
-        // Locked until the member's transaction ends: a second run visiting
-        // him waits here and then sees the dues this one posted.
-        const QString sql =
-            QStringLiteral("SELECT * FROM tbQuotas_Socios WHERE (socio_id=?)") + m_connection.dialect().forUpdate();
-        if (member.isNull(QStringLiteral("squota_id")))
-            createAccount(member);
-        m_account.open(sql, m_connection, Cursor::Keyset, Lock::Pessimistic, {no});
-        if (m_account.eof()) {
-            // Deleted since the members were read.
-            createAccount(member);
-            m_account.open(sql, m_connection, Cursor::Keyset, Lock::Pessimistic, {no});
-        }
-        if (m_account.eof())
-            throw DbError(QStringLiteral("Não foi possível criar a conta de quotas do associado."));
-    }
-
     void createAccount(Recordset& member)
     {
         QVariant rend1 = kUnknownCategoryRend1;
@@ -117,8 +107,7 @@ private:
     DuesCounter m_counter;
     Recordset m_categories;
     Recordset m_employers;
-    Recordset m_account;
-    Recordset m_movements;
+    DuesAccount m_account;
     GenerationOutcome m_outcome;
 };
 

@@ -67,7 +67,6 @@ frmGerarQuotas::frmGerarQuotas(QDate today, QWidget* parent) : QDialog(parent)
     Text2 = placed(new QLineEdit(Frame1), "Text2", twips(1740, 780, 4455, 285));
     // The name only answers the staff number; typing there would change nothing.
     Text2->setReadOnly(true);
-    Label4->setBuddy(No_Tap);
 
     for (QListWidget* list : {List1, List2})
         list->setSelectionMode(QAbstractItemView::SingleSelection);

@@ -166,6 +166,9 @@ void frmGerarQuotas::execute()
     } catch (const QuotasError& e) {
         // What was saved stays saved; the dialog stays open for another try.
         msgBox(e.message(), Buttons::Ok, Icon::Critical, kCaption);
+    } catch (const std::exception& e) {
+        // Nothing may escape a button's handler into the event loop.
+        msgBox(QString::fromLocal8Bit(e.what()), Buttons::Ok, Icon::Critical, kCaption);
     }
 }
 

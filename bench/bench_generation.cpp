@@ -56,15 +56,15 @@ void generateSetBased(Connection& c)
     // The end date's month at or after the processing month: on or after its first day.
     postSetBased(c, 2, QStringLiteral("Seguro"), QStringLiteral("ult_perc_seguro"),
                  QStringLiteral(" AND s.seguro <> 0 AND (s.seguro_data_rescisao IS NULL OR s.seguro_data_rescisao >= ?)"));
-    const QString dueOf = QStringLiteral("(SELECT m.quota FROM tbQuotas_Movimentos m WHERE m.socio_id = "
-                                         "tbQuotas_Socios.socio_id AND m.ano = ? AND m.mes = ? AND m.tipo = %1)");
-    c.execute(QStringLiteral("UPDATE tbQuotas_Socios SET "
-                             "total_quotas = total_quotas + COALESCE((SELECT SUM(m.quota) FROM tbQuotas_Movimentos m "
-                             "WHERE m.socio_id = tbQuotas_Socios.socio_id AND m.ano = ? AND m.mes = ?), 0), "
-                             "ult_quota_sindicato = COALESCE(%1, ult_quota_sindicato), "
-                             "ult_quota_seguro = COALESCE(%2, ult_quota_seguro), ult_ano = ?, ult_mes = ?")
-                  .arg(dueOf.arg(1), dueOf.arg(2)),
-              {kAno, kMes, kAno, kMes, kAno, kMes, kAno, kMes});
+    // One aggregate joined once: a correlated subquery per account would be
+    // planned as a scan per account on tables that have no statistics yet.
+    c.execute(QStringLiteral("UPDATE tbQuotas_Socios SET total_quotas = total_quotas + d.total, "
+                             "ult_quota_sindicato = COALESCE(d.sindicato, ult_quota_sindicato), "
+                             "ult_quota_seguro = COALESCE(d.seguro, ult_quota_seguro), ult_ano = ?, ult_mes = ? "
+                             "FROM (SELECT socio_id, SUM(quota) AS total, MAX(CASE WHEN tipo = 1 THEN quota END) AS sindicato, "
+                             "MAX(CASE WHEN tipo = 2 THEN quota END) AS seguro FROM tbQuotas_Movimentos "
+                             "WHERE ano = ? AND mes = ? GROUP BY socio_id) d WHERE tbQuotas_Socios.socio_id = d.socio_id"),
+              {kAno, kMes, kAno, kMes});
     c.execute(QStringLiteral("INSERT INTO tbcontadores (quotas) SELECT COALESCE(MAX(quota_no), 0) FROM tbQuotas_Movimentos"));
     tx.commit();
 }

@@ -14,6 +14,7 @@
 #include <QApplication>
 #include <QLineEdit>
 #include <QListWidget>
+#include <QMessageBox>
 #include <QPushButton>
 #include <QTest>
 #include <QTimer>
@@ -201,6 +202,32 @@ private slots:
         QCOMPARE(boxes.texts(), QStringList({kUnknown}));
         QVERIFY(d.isVisible());
         QCOMPARE(QApplication::focusWidget(), d.No_Tap);
+    }
+
+    // With Qt's own box the focus goes to the box and back: one message
+    // per attempt to leave, and the dialog's focus stays in the field.
+    void qtMessageBoxKeepsTheFocusInTheField()
+    {
+        frmGerarQuotas& d = open();
+        int shown = 0;
+        QTimer answerer;
+        connect(&answerer, &QTimer::timeout, this, [&] {
+            if (auto* box = qobject_cast<QMessageBox*>(QApplication::activeModalWidget())) {
+                ++shown;
+                QCOMPARE(box->text(), kUnknown);
+                QTest::keyClick(box, Qt::Key_Return);
+            }
+        });
+        answerer.start(20);
+        typeStaffNumber(QStringLiteral("999"));
+        QCOMPARE(shown, 1);
+        QApplication::setActiveWindow(&d);  // what the desktop does once the box is gone
+        QCOMPARE(QApplication::focusWidget(), d.No_Tap);
+        QTest::mouseClick(d.Command1, Qt::LeftButton);
+        QCOMPARE(shown, 2);
+        QApplication::setActiveWindow(&d);
+        QCOMPARE(QApplication::focusWidget(), d.No_Tap);
+        QVERIFY(d.isVisible());
     }
 
     void cancellingNeedsNoValidNumber()

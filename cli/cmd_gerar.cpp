@@ -1,10 +1,40 @@
 #include "cli/commands.h"
+#include "cli/options.h"
+#include "component/shared_objects.h"
+#include "generation/member_lookup.h"
+#include "generation/processar_quotas.h"
+#include "platform/message_boxes.h"
 
 namespace quotas::cli {
 
-int gerar(const QStringList&)
+// The dialog's run without the dialog: no confirmation, the same closing
+// message, and the dues that could not be generated after it.
+int gerar(const QStringList& args)
 {
-    throw QuotasError(QStringLiteral("o comando \"gerar\" ainda não está disponível nesta versão."));
+    const Options options(QStringLiteral("gerar"),
+                          {{QStringLiteral("ano"), QStringLiteral("Ano de processamento."), QStringLiteral("A")},
+                           {QStringLiteral("mes"), QStringLiteral("Mês de processamento (1 a 12)."), QStringLiteral("M")},
+                           {QStringLiteral("no-tap"), QStringLiteral("Só o associado com este Número de Empresa."),
+                            QStringLiteral("N")}},
+                          args);
+    const int ano = options.number(QStringLiteral("ano"), 1900, 9999);
+    const int mes = options.number(QStringLiteral("mes"), 1, 12);
+    connectOrFail();
+    int socio = 0;
+    // An empty number means every member, as in the dialog.
+    const QString noTap = options.value(QStringLiteral("no-tap"));
+    if (!noTap.isEmpty()) {
+        const std::optional<StaffMember> member = findMemberByStaffNumber(Data().SqlServer, noTap);
+        if (!member)
+            throw UsageError(QStringLiteral("Número de Empresa não existe!"));
+        socio = member->socioId;
+    }
+    const GenerationOutcome outcome = ProcessarQuotas(ano, mes, socio);
+    msgBox(QStringLiteral("Fim do processamento de quotizações"), Buttons::Ok, Icon::Information,
+           QStringLiteral("Gerar Quotas"));
+    if (outcome.notGenerated() > 0)
+        msgBox(outcome.summary(), Buttons::Ok, Icon::Exclamation, QStringLiteral("Gerar Quotas"));
+    return 0;
 }
 
 }  // namespace quotas::cli

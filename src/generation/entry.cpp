@@ -1,12 +1,20 @@
 #include "generation/entry.h"
 
-#include "component/not_available.h"
+#include "component/shared_objects.h"
+#include "generation/frm_gerar_quotas.h"
 
 namespace quotas {
 
 void showGenerationDialog()
 {
-    windowNotAvailable(QStringLiteral("Gerar Quotas"));
+    SharedObjects& objects = shared();
+    if (!objects.frmGerarQuotas)
+        objects.frmGerarQuotas = new frmGerarQuotas();
+    auto* dialog = static_cast<frmGerarQuotas*>(objects.frmGerarQuotas.data());
+    dialog->load(QDate::currentDate());
+    dialog->exec();
+    // Closed by either button: unloaded, so the next showing starts afresh.
+    delete dialog;
 }
 
 }  // namespace quotas

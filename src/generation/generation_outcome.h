@@ -1,0 +1,28 @@
+#pragma once
+
+#include <QString>
+#include <QStringList>
+
+namespace quotas {
+
+// What a generation run did, and the dues it could not post.
+struct GenerationOutcome {
+    int members = 0;         // members visited
+    int posted = 0;          // movements created
+    int accountsCreated = 0;
+    // Dues not posted because the account has no remuneration 1 or 2.
+    int missingRemuneration = 0;
+    // Dues not posted because the employer's rate is empty.
+    int missingRate = 0;
+    // Staff numbers (or member keys when there is none) of those members,
+    // once each, in the order met.
+    QStringList membersMissingRemuneration;
+    QStringList membersMissingRate;
+
+    int notGenerated() const { return missingRemuneration + missingRate; }
+    // The Portuguese account of the dues not generated and why; empty when
+    // every due could be posted.
+    QString summary() const;
+};
+
+}  // namespace quotas

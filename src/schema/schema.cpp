@@ -91,10 +91,9 @@ std::vector<TableDef> tables()
         // One due of each type per member and month: two generation runs at
         // once can never charge a member twice.
         {QStringLiteral("tbQuotas_Movimentos"), movementColumns(),
-         // Led by the month, the same index serves the import (one month, one
-         // type); the member's movements have their own.
-         {QStringLiteral("UNIQUE ux_tbquotas_movimentos_due ON (ano, mes, tipo, socio_id)"),
-          QStringLiteral("ix_tbquotas_movimentos_socio ON (socio_id)")},
+         // It also finds a member's movements; the import reads a whole month
+         // once per run, which needs no index of its own.
+         {QStringLiteral("UNIQUE ux_tbquotas_movimentos_due ON (socio_id, ano, mes, tipo)")},
          {}},
         {QStringLiteral("tbQuotas_Movimentos_Inactivos"), movementColumns(),
          {QStringLiteral("ix_tbquotas_movimentos_inactivos_socio ON (socio_id)")}, {}},

@@ -1,24 +1,15 @@
 // The command line as scripts use it: settings, schema, login, exit statuses.
 
+#include "support/cli_process.h"
 #include "support/test_database.h"
 
 #include <QFile>
-#include <QProcess>
 #include <QTest>
 #include <sys/stat.h>
 
 using namespace quotas;
-using quotas::test::TestDatabase;
-
-namespace {
-
-struct Run {
-    int status = -1;
-    QString out;
-    QString err;
-};
-
-}  // namespace
+using namespace quotas::test;
+using Run = CliRun;
 
 class CliTest : public QObject {
     Q_OBJECT
@@ -26,13 +17,7 @@ class CliTest : public QObject {
     std::unique_ptr<TestDatabase> db;
     QString registry;
 
-    Run quotas(const QStringList& args)
-    {
-        QProcess p;
-        p.start(QStringLiteral(QUOTAS_CLI_BINARY), QStringList{QStringLiteral("--registry"), registry} + args);
-        p.waitForFinished(60000);
-        return {p.exitCode(), QString::fromUtf8(p.readAllStandardOutput()), QString::fromUtf8(p.readAllStandardError())};
-    }
+    Run quotas(const QStringList& args) { return runQuotas(registry, args); }
 
     Run configure()
     {

@@ -28,9 +28,6 @@ private slots:
         QTest::newRow("tbSocios") << "tbSocios"
                                   << QStringList{"socio_id", "no_tap", "nome", "nome_guerra", "morada1", "code_postal1",
                                                  "localidade1", "fuv", "empresa", "seguro", "seguro_data_rescisao"};
-        QTest::newRow("tbfuvs") << "tbfuvs" << QStringList{"code", "rend1"};
-        QTest::newRow("tbEmpresas") << "tbEmpresas" << QStringList{"code", "percent_sindicato"};
-        QTest::newRow("tbcontadores") << "tbcontadores" << QStringList{"quotas"};
         QTest::newRow("tbQuotas_Socios") << "tbQuotas_Socios" << account;
         QTest::newRow("tbQuotas_Socios_Inactivos") << "tbQuotas_Socios_Inactivos" << account;
         QTest::newRow("tbQuotas_Movimentos") << "tbQuotas_Movimentos" << movement;
@@ -40,8 +37,6 @@ private slots:
         for (int i = 0; i <= 20; ++i)
             fields << QStringLiteral("Field%1").arg(i);
         QTest::newRow("extras") << "extras" << fields;
-        QTest::newRow("tbmeses") << "tbmeses" << QStringList{"code", "descrit"};
-        QTest::newRow("tbsexos") << "tbsexos" << QStringList{"code"};
     }
     void everyTableHasTheColumnsTheRunsUse()
     {
@@ -108,26 +103,21 @@ private slots:
 
     void demoMembersAreTheSameEverywhere()
     {
+        const QString select = QStringLiteral(
+            "SELECT COUNT(*), SUM(seguro), COUNT(seguro_data_rescisao), SUM(CASE WHEN fuv = 'Z9' THEN 1 ELSE 0 END), "
+            "SUM(CASE WHEN empresa = 'XPT' THEN 1 ELSE 0 END), MIN(nome), MAX(morada1) FROM tbSocios");
         QStringList runs;
         for (int attempt = 0; attempt < 2; ++attempt) {
             TestDatabase db;
             QCOMPARE(addDemoMembers(db.connection(), 300), 300);
             Recordset rs;
-            rs.open(QStringLiteral("SELECT no_tap, nome, fuv, empresa, seguro, seguro_data_rescisao FROM tbSocios ORDER BY socio_id"),
-                    db.connection());
-            QString all;
-            int insured = 0, ending = 0, unknownCategory = 0, unknownEmployer = 0;
-            for (; !rs.eof(); rs.moveNext()) {
-                for (int i = 0; i < rs.fieldCount(); ++i)
-                    all += rs.value(i).toString() + u'|';
-                insured += rs.value(QStringLiteral("seguro")).toInt();
-                ending += rs.isNull(QStringLiteral("seguro_data_rescisao")) ? 0 : 1;
-                unknownCategory += rs.value(QStringLiteral("fuv")).toString() == QStringLiteral("Z9") ? 1 : 0;
-                unknownEmployer += rs.value(QStringLiteral("empresa")).toString() == QStringLiteral("XPT") ? 1 : 0;
-            }
-            QVERIFY(insured > 60 && ending > 5 && unknownCategory > 0 && unknownEmployer > 0);
-            runs << all;
-            QCOMPARE(db.connection().scalar(QStringLiteral("SELECT COUNT(*) FROM tbfuvs")).toInt(), 6);
+            rs.open(select, db.connection());
+            QStringList row;
+            for (int i = 0; i < rs.fieldCount(); ++i)
+                row << rs.value(i).toString();
+            // Some insured, some with an end date, some unknown categories and employers.
+            QVERIFY(row[1].toInt() > 60 && row[2].toInt() > 5 && row[3].toInt() > 0 && row[4].toInt() > 0);
+            runs << row.join(u'|');
         }
         QCOMPARE(runs[0], runs[1]);
     }

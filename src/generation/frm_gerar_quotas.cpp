@@ -1,4 +1,5 @@
 #include "generation/frm_gerar_quotas.h"
+#include "platform/dialog_layout.h"
 
 #include "component/shared_objects.h"
 #include "generation/member_lookup.h"
@@ -19,12 +20,6 @@ namespace quotas {
 namespace {
 
 const QString kCaption = QStringLiteral("Gerar Quotas");
-
-// The layout is kept in twips, as the dialog was drawn; 15 twips a pixel.
-QRect twips(int left, int top, int width, int height)
-{
-    return QRect(left / 15, top / 15, width / 15, height / 15);
-}
 
 // The long month names in the language of the union's staff.
 const QStringList& monthNames()
@@ -51,7 +46,8 @@ frmGerarQuotas::frmGerarQuotas(QDate today, QWidget* parent) : QDialog(parent)
     setObjectName(QStringLiteral("frmGerarQuotas"));
     setWindowTitle(kCaption);
     setModal(true);
-    setFixedSize(6705 / 15, 4455 / 15);
+    setFixedSize(twips(0, 0, 6705, 4455).size());
+    useDialogFont(this);
 
     Label3 = placed(new QLabel(QStringLiteral("Ano de Processamento:"), this), "Label3", twips(300, 180, 1755, 255));
     List1 = placed(new QListWidget(this), "List1", twips(300, 480, 1815, 2400));

@@ -1,4 +1,5 @@
 #include "import/frm_importar_quotas.h"
+#include "platform/dialog_layout.h"
 
 #include "component/shared_objects.h"
 #include "import/processar_importacao.h"
@@ -15,12 +16,6 @@
 namespace quotas {
 
 namespace {
-
-// Positions are kept as laid out in twips, at 15 twips to the pixel (96 DPI).
-QRect twips(int left, int top, int width, int height)
-{
-    return QRect(left / 15, top / 15, width / 15, height / 15);
-}
 
 QDate& pinnedToday()
 {
@@ -80,6 +75,7 @@ FrmImportarQuotas::FrmImportarQuotas(QWidget* owner)
     setWindowTitle(QStringLiteral("Importar Registos de Quotas"));
     setAttribute(Qt::WA_DeleteOnClose);
     setFixedSize(twips(0, 0, 6945, 3795).size());
+    useDialogFont(this);
     setSizeGripEnabled(false);
 
     // Neither button answers Enter by itself.

@@ -1,4 +1,5 @@
 #include "maintenance/frm_manutencao_dados.h"
+#include "platform/dialog_layout.h"
 
 #include "component/shared_objects.h"
 #include "maintenance/processar_manutencao.h"
@@ -15,27 +16,14 @@
 
 namespace quotas {
 
-namespace {
-
-// The layout is given in twips; the screen has 15 of them to a pixel.
-QRect twips(int left, int top, int width, int height)
-{
-    return QRect(left / 15, top / 15, width / 15, height / 15);
-}
-
-}  // namespace
-
 FrmManutencaoDados::FrmManutencaoDados(QWidget* parent)
     : QDialog(parent, Qt::Dialog | Qt::MSWindowsFixedSizeDialogHint | Qt::WindowTitleHint | Qt::WindowSystemMenuHint
                           | Qt::WindowCloseButtonHint)
 {
     setObjectName(QStringLiteral("frmManutencaoDados"));
     setWindowTitle(maintenanceCaption());
-    setFixedSize(7725 / 15, 4290 / 15);
-    // The labels are 13 pixels high: a small font keeps their text whole.
-    QFont small = font();
-    small.setPixelSize(11);
-    setFont(small);
+    setFixedSize(twips(0, 0, 7725, 4290).size());
+    useDialogFont(this);
 
     auto label = [this](const char* name, const QString& text, const QRect& geometry) {
         auto* l = new QLabel(text, this);

@@ -52,6 +52,8 @@ QTableWidget* table(QWidget* parent, const QStringList& headers, int stretch)
     t->setSelectionBehavior(QAbstractItemView::SelectRows);
     t->setSelectionMode(QAbstractItemView::SingleSelection);
     t->verticalHeader()->hide();
+    t->verticalHeader()->setDefaultSectionSize(t->fontMetrics().height() + 6);
+    t->horizontalHeader()->setSectionResizeMode(QHeaderView::ResizeToContents);
     t->horizontalHeader()->setSectionResizeMode(stretch, QHeaderView::Stretch);
     return t;
 }
@@ -268,9 +270,10 @@ void MainWindow::refreshMembers()
         m_members->setItem(row, 3, cell(hasAccount ? quotas::formatMoney(paid, locale) : QString(), true));
         m_members->setItem(row, 4, cell(hasAccount ? quotas::formatMoney(charged - paid, locale) : QString(), true));
     }
+    // The member chosen before stays chosen; at the start, the first one.
     const int selected = rowOf(m_members, member);
-    if (selected >= 0)
-        m_members->setCurrentCell(selected, 0);
+    if (selected >= 0 || m_members->rowCount() > 0)
+        m_members->setCurrentCell(std::max(selected, 0), 0);
     refreshMovements(movement);
     statusBar()->showMessage(QStringLiteral("%1 associados").arg(m_members->rowCount()));
 }

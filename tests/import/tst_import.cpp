@@ -44,17 +44,6 @@ QString rejected(int n)
     return QStringLiteral("Critical: Durante o processo de importação de dados não foram registados %1 associados.").arg(n);
 }
 
-// The message of the QuotasError a call throws.
-QString failure(const std::function<void()>& call)
-{
-    try {
-        call();
-    } catch (const QuotasError& e) {
-        return e.message();
-    }
-    return QStringLiteral("accepted");
-}
-
 QListWidget* list(const char* name)
 {
     return shared().frmImportarQuotas->findChild<QListWidget*>(QLatin1String(name));
@@ -217,7 +206,6 @@ private slots:
         registry = db->useAsSettings();
         FrmImportarQuotas::pinToday(QDate(2004, 3, 15));
     }
-    void cleanupTestCase() { db.reset(); }
     void init()
     {
         db->clear();
@@ -235,62 +223,44 @@ private slots:
         RecordingProgress::uninstall();
     }
 
-    void decodesTheEncodingsOfTheOffice_data()
+    // What is read, "header/line/...", values split by "|"; or what is wrong with the file.
+    void readsTheFilesOfTheOffice_data()
     {
         QTest::addColumn<QByteArray>("bytes");
-        QTest::newRow("UTF-8") << QByteArray("Jo\xC3\xA3o \xE2\x82\xAC \xE2\x80\x9C");
-        QTest::newRow("UTF-8 with BOM") << QByteArray("\xEF\xBB\xBFJo\xC3\xA3o \xE2\x82\xAC \xE2\x80\x9C");
-        QTest::newRow("Windows-1252") << QByteArray("Jo\xE3o \x80 \x93");
-        QTest::newRow("UTF-16LE with BOM") << QByteArray("\xFF\xFEJ\0o\0\xE3\0o\0 \0\xAC\x20 \0\x1C\x20", 18);
-    }
-    void decodesTheEncodingsOfTheOffice()
-    {
-        QFETCH(QByteArray, bytes);
-        QCOMPARE(decodeImportText(bytes), QStringLiteral("João € “"));
-    }
-
-    void readsDelimitersAndQuotes_data()
-    {
-        QTest::addColumn<QString>("text");
-        QTest::addColumn<QList<QStringList>>("records");  // the header first
-        QTest::newRow("semicolon, CRLF, case kept") << "no_tap;Quota\r\n1;2,5\r\n" << QList<QStringList>{{"no_tap", "Quota"}, {"1", "2,5"}};
+        QTest::addColumn<QString>("read");
+        const QString joao = "João € “", invalid = "não é um ficheiro CSV válido: ";
+        QTest::newRow("UTF-8") << QByteArray("Jo\xC3\xA3o \xE2\x82\xAC \xE2\x80\x9C") << joao;
+        QTest::newRow("UTF-8 with BOM") << QByteArray("\xEF\xBB\xBFJo\xC3\xA3o \xE2\x82\xAC \xE2\x80\x9C") << joao;
+        QTest::newRow("Windows-1252") << QByteArray("Jo\xE3o \x80 \x93") << joao;
+        QTest::newRow("UTF-16LE with BOM") << QByteArray("\xFF\xFEJ\0o\0\xE3\0o\0 \0\xAC\x20 \0\x1C\x20", 18) << joao;
+        QTest::newRow("semicolon, CRLF, case kept") << QByteArray("no_tap;Quota\r\n1;2,5\r\n") << "no_tap|Quota/1|2,5";
         QTest::newRow("comma, quoted delimiter, quotes and break")
-            << "no_tap,quota,nome\n7,\"12,50\",\"Silva, \"\"Zé\"\"\nda Ponte\"\n"
-            << QList<QStringList>{{"no_tap", "quota", "nome"}, {"7", "12,50", "Silva, \"Zé\"\nda Ponte"}};
-        QTest::newRow("tab, empty value kept") << "a\tb\tc\n1\t\t3\n" << QList<QStringList>{{"a", "b", "c"}, {"1", "", "3"}};
-        QTest::newRow("semicolon wins a tie, comma inside quotes") << "\"x,y\";b,c\n1;2,3\n"
-                                                                   << QList<QStringList>{{"x,y", "b,c"}, {"1", "2,3"}};
+            << QByteArray("no_tap,quota,nome\n7,\"12,50\",\"Silva, \"\"Zé\"\"\nda Ponte\"\n") << "no_tap|quota|nome/7|12,50|Silva, \"Zé\"\nda Ponte";
+        QTest::newRow("tab, empty value kept") << QByteArray("a\tb\tc\n1\t\t3\n") << "a|b|c/1||3";
+        QTest::newRow("semicolon wins a tie, comma inside quotes") << QByteArray("\"x,y\";b,c\n1;2,3\n") << "x,y|b,c/1|2,3";
         QTest::newRow("spaces, short line, blank lines, trailing delimiter, no final break")
-            << " a ; b ;c\n\n 1 ;\" 2 \"\n\n3;4;5;" << QList<QStringList>{{"a", "b", "c"}, {"1", " 2 "}, {"3", "4", "5"}};
-        QTest::newRow("nothing") << QString() << QList<QStringList>{{}};
-    }
-    void readsDelimitersAndQuotes()
-    {
-        QFETCH(QString, text);
-        QFETCH(QList<QStringList>, records);
-        const CsvTable table = parseCsv(text, QStringLiteral("f.csv"));
-        QCOMPARE(QList<QStringList>{table.header} + table.rows, records);
-    }
-
-    void refusesMalformedFiles_data()
-    {
-        QTest::addColumn<QByteArray>("bytes");
-        QTest::addColumn<QString>("reason");
-        const QString invalid = QStringLiteral("não é um ficheiro CSV válido: ");
+            << QByteArray(" a ; b ;c\n\n 1 ;\" 2 \"\n\n3;4;5;") << "a|b|c/1| 2 /3|4|5";
         QTest::newRow("quote inside a value") << QByteArray("a;b\n1;2\n3;x\"y\n") << invalid + "há aspas fora do lugar na linha 3.";
-        QTest::newRow("text after a closing quote") << QByteArray("a;b\n\"1\"x;2\n") << invalid + "há aspas fora do lugar na linha 2.";
         QTest::newRow("quote left open") << QByteArray("a;b\n1;2\n3;\"4\n5;6\n")
                                          << invalid + "um valor entre aspas começado na linha 3 não foi fechado.";
         QTest::newRow("more values than names")
             << QByteArray("a;b\n1;2\n1;2;3\n") << invalid + "a linha 3 tem 3 valores, mais do que os 2 nomes de colunas da primeira linha.";
         QTest::newRow("not text") << QByteArray("PK\x03\x04\0\0", 6) << "não é um ficheiro de texto CSV.";
     }
-    void refusesMalformedFiles()
+    void readsTheFilesOfTheOffice()
     {
         QFETCH(QByteArray, bytes);
-        QFETCH(QString, reason);
+        QFETCH(QString, read);
         const QString path = useFile(bytes);
-        QCOMPARE(failure([&] { readCsvFile(path); }), QStringLiteral("O ficheiro \"%1\" ").arg(path) + reason);
+        QStringList got;
+        try {
+            const CsvTable table = readCsvFile(path);
+            for (const QStringList& record : QList<QStringList>{table.header} + table.rows)
+                got << record.join(u'|');
+        } catch (const QuotasError& e) {
+            got << QString(e.message()).remove(QStringLiteral("O ficheiro \"%1\" ").arg(path));
+        }
+        QCOMPARE(got.join(u'/'), read);
     }
 
     // Nothing changes, extras included, and no listing follows.
@@ -299,26 +269,22 @@ private slots:
         QTest::addColumn<QByteArray>("file");  // "cancelled": the user cancelled the choice of a file
         QTest::addColumn<int>("month");
         QTest::addColumn<QStringList>("shown");
-        QTest::addColumn<QStringList>("progress");
         const QStringList noLines{"Information: Não foram indicados registos para importar."};
         const QStringList noColumns{"Information: Não foram especificados os campos no_tap ou quota."};
-        QTest::newRow("empty file") << QByteArray() << 3 << noLines << QStringList{};
-        QTest::newRow("header only") << QByteArray("no_tap;quota\r\n\r\n") << 3 << noLines << QStringList{};
-        QTest::newRow("No_tap") << QByteArray("No_tap;quota\n100;8\n") << 3 << noColumns << QStringList{};
-        QTest::newRow("QUOTA") << QByteArray("no_tap;QUOTA\n100;8\n") << 3 << noColumns << QStringList{};
-        QTest::newRow("no quota") << QByteArray("no_tap;rend1\n100;8\n") << 3 << noColumns << QStringList{};
-        QTest::newRow("cancelled") << QByteArray("cancelled") << 3 << QStringList{} << QStringList{};
-        QTest::newRow("nothing charged in May")
-            << QByteArray("no_tap;quota\n100;8.00\n999;1\n") << 5
-            << QStringList{"None: Não foram processados os registos de quotas referente a 5 / 2004."}
-            << QStringList{"Iniciar(2, Transferindo dados, aguarde uns momentos . . ., )", "terminar()"};
+        QTest::newRow("empty file") << QByteArray() << 3 << noLines;
+        QTest::newRow("header only") << QByteArray("no_tap;quota\r\n\r\n") << 3 << noLines;
+        QTest::newRow("No_tap") << QByteArray("No_tap;quota\n100;8\n") << 3 << noColumns;
+        QTest::newRow("QUOTA") << QByteArray("no_tap;QUOTA\n100;8\n") << 3 << noColumns;
+        QTest::newRow("no quota") << QByteArray("no_tap;rend1\n100;8\n") << 3 << noColumns;
+        QTest::newRow("cancelled") << QByteArray("cancelled") << 3 << QStringList{};
+        QTest::newRow("nothing charged in May") << QByteArray("no_tap;quota\n100;8.00\n999;1\n") << 5
+                                                << QStringList{"None: Não foram processados os registos de quotas referente a 5 / 2004."};
     }
     void refusesWhatCannotBeImported()
     {
         QFETCH(QByteArray, file);
         QFETCH(int, month);
         QFETCH(QStringList, shown);
-        QFETCH(QStringList, progress);
         charged(1, "100", 10.0);
         c().execute(QStringLiteral("INSERT INTO extras (Field0) VALUES ('antes')"));
         const QStringList before = snapshot();
@@ -329,7 +295,6 @@ private slots:
         ScriptedBoxes boxes;
         run(month);
         QCOMPARE(told(boxes), shown);
-        QCOMPARE(RecordingProgress::log().calls, progress);
         QCOMPARE(snapshot(), before);
         QVERIFY(listings.isEmpty());
     }
@@ -482,19 +447,13 @@ private slots:
     // transaction, so a failure could leave it half written.
     void extrasIsRewrittenWhollyOrNotAtAll()
     {
-        c().execute(engineUnderTest() == Engine::SQLite
-                        ? QStringLiteral("CREATE TRIGGER refuse BEFORE INSERT ON extras WHEN NEW.Field0 = 'boom' "
-                                         "BEGIN SELECT RAISE(ABORT, 'boom'); END")
-                        : QStringLiteral("CREATE FUNCTION refuse() RETURNS trigger AS $$ BEGIN IF NEW.field0 = 'boom' THEN RAISE "
-                                         "EXCEPTION 'boom'; END IF; RETURN NEW; END $$ LANGUAGE plpgsql; CREATE TRIGGER refuse "
-                                         "BEFORE INSERT ON extras FOR EACH ROW EXECUTE FUNCTION refuse()"));
+        c().execute(QStringLiteral("CREATE UNIQUE INDEX refuse ON extras (Field0)"));  // the second 998 fails
         charged(1, "100", 10.0);
         c().execute(QStringLiteral("INSERT INTO extras (Field0) VALUES ('a'), ('b')"));
-        useFile("no_tap;quota\n998;1\nboom;1\n100;8\n");
+        useFile("no_tap;quota\n998;1\n998;2\n100;8\n");
         ScriptedBoxes boxes;
         QVERIFY(!run().extrasSaved);
-        c().execute(engineUnderTest() == Engine::SQLite ? QStringLiteral("DROP TRIGGER refuse")
-                                                        : QStringLiteral("DROP FUNCTION refuse() CASCADE"));
+        c().execute(QStringLiteral("DROP INDEX refuse"));
         QCOMPARE(told(boxes).size(), 2);
         QVERIFY(told(boxes)[1].startsWith("Critical: Não foi possível gravar os registos não importados"));
         QCOMPARE(rows("SELECT Field0 FROM extras ORDER BY extra_id"), QStringList({"a", "b"}));
@@ -517,8 +476,6 @@ private slots:
                  QStringLiteral("Não foram processados os registos de quotas referente a 7 / 2004.\n"));
         const CliRun missing = importar({"--ano", "2004", "--mes", "3", "--tipo", "1", file + "x"});
         QVERIFY(missing.status == 1 && missing.err.contains(QStringLiteral("O ficheiro \"%1x\" não existe.").arg(file)));
-        QCOMPARE(importar({"--ano", "2004", "--mes", "13", "--tipo", "1", file}).status, 2);
-        QCOMPARE(importar({"--ano", "2004", "--mes", "3", "--tipo", "1"}).status, 2);
     }
 
     // Not modal, one at a time, on today's choices; the check box sets the
@@ -533,13 +490,9 @@ private slots:
                                               "Setembro", "Outubro", "Novembro", "Dezembro"}));
         QCOMPARE(items("List3"), QStringList({"[Sindicato]", "Plano de Saúde"}));
         QCOMPARE(open(), dialog);
-        auto* check = dialog->findChild<QCheckBox*>("Check1");
-        QVERIFY(check->isChecked());
+        QVERIFY(dialog->findChild<QCheckBox*>("Check1")->isChecked());
         click("Check1");
         QVERIFY(shared().SemSeparadorDecimal);
-        click("Check1");
-        QVERIFY(!shared().SemSeparadorDecimal);
-        click("Check1");
         QTest::keyClick(dialog, Qt::Key_Escape);  // no cancel key
         QVERIFY(dialog->isVisible());
         dialog->close();

@@ -89,8 +89,8 @@ Q_DECLARE_METATYPE(LastValues)
 
 // In the dialog, with member 1 charged 20.00 of insurance for March 2004:
 // the year, month and type picked, the amount of the file's one line (the
-// check box cleared when it has no point), the button, the box shown and
-// what was paid.
+// check box cleared when it has no point), the button, the box shown
+// ("<file>" for the file's path) and what was paid.
 struct Selection {
     QString year, month, type;
     QByteArray amount;
@@ -169,12 +169,7 @@ private slots:
             listings << QStringLiteral("rows=%1 prints=%2").arg(rows("SELECT COUNT(*) FROM extras")[0]).arg(Data().SqlServer_Prints.state());
         });
     }
-    void cleanup()
-    {
-        delete shared().frmImportarQuotas.data();
-        setRejectsListing({});
-        RecordingProgress::uninstall();
-    }
+    void cleanup() { delete shared().frmImportarQuotas.data(); }
 
     // What is read, "header/line/...", values split by "|"; or what is wrong with the file.
     void readsTheFilesOfTheOffice_data()
@@ -461,13 +456,17 @@ private slots:
         QTest::newRow("union due, March 2004") << Selection{"2004", "Março", "Sindicato", "5.00", "Command1", none.arg("3 / 2004"), "0"};
         QTest::newRow("health plan, March 2004") << Selection{"2004", "Março", "Plano de Saúde", "5.00", "Command1", "", "5"};
         QTest::newRow("whole cents") << Selection{"2004", "Março", "Plano de Saúde", "500", "Command1", "", "5"};
+        QTest::newRow("a file that cannot be read")
+            << Selection{"2004", "Março", "Plano de Saúde", "\"5.00", "Command1",
+                         "Critical: O ficheiro \"<file>\" não é um ficheiro CSV válido: um valor entre aspas começado na linha 2 "
+                         "não foi fechado.", "0"};
         QTest::newRow("Cancelar") << Selection{"2004", "Março", "Plano de Saúde", "5.00", "Command2", "", "0"};
     }
     void dialogRunsOnTheSelectionAndCloses()
     {
         QFETCH(Selection, s);
         charged(1, "100", 20.0, 0.0, 2);
-        useFile("no_tap;quota\n100;" + s.amount + "\n");
+        const QString path = useFile("no_tap;quota\n100;" + s.amount + "\n");
         open();
         if (s.month == "março")
             list("List2")->currentItem()->setText(s.month);
@@ -479,7 +478,7 @@ private slots:
         ScriptedBoxes boxes;
         click(s.button);
         QTRY_VERIFY(!shared().frmImportarQuotas);  // closed after the run
-        QCOMPARE(told(boxes), s.message.isEmpty() ? QStringList() : QStringList{s.message});
+        QCOMPARE(told(boxes), s.message.isEmpty() ? QStringList() : QStringList{s.message.replace("<file>", path)});
         QCOMPARE(rows("SELECT pago FROM tbQuotas_Movimentos"), QStringList{s.paid});
     }
 };

@@ -37,6 +37,8 @@ void RecordingProgress::setvalor(int done)
 {
     log().calls << QStringLiteral("setvalor(%1)").arg(done);
     log().value += done;
+    if (log().afterStep)
+        log().afterStep();
 }
 
 void RecordingProgress::terminar()

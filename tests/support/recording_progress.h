@@ -2,6 +2,7 @@
 
 #include <QObject>
 #include <QStringList>
+#include <functional>
 
 namespace quotas::test {
 
@@ -12,6 +13,8 @@ struct ProgressLog {
     int maximum = 0;
     int value = 0;
     bool showing = false;
+    // Called after each step, to let a second user act while a run is under way.
+    std::function<void()> afterStep;
 };
 
 // A progress display under "Velumo.General" that only records; install()

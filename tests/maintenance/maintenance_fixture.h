@@ -1,142 +1,87 @@
 #pragma once
 
-// Rows and checks shared by the maintenance tests, on either engine.
+// Rows the maintenance tests set up and read back, on either engine, in one
+// short notation: "SA 1 40.5 12.25" is an account (member, total_quotas,
+// total_pago; SI an inactive one), "A 3 12.5 -" a movement (member, quota,
+// pago; I inactive, H history), "H 3 - 0 12.5 -" one with rend1 and rend2
+// too. "-" is Null; a movement given without them has rend1 1000, rend2 0.
 
-#include "component/money.h"
 #include "platform/connection.h"
+#include "platform/recordset.h"
 
 #include <QDate>
-#include <QString>
-#include <QVariant>
-#include <cmath>
+#include <QHash>
+#include <QLocale>
+#include <QStringList>
 
 namespace quotas::test {
 
-inline QVariant null()
-{
-    return QVariant(QMetaType::fromType<double>());
-}
+// The tables by their short names.
+inline const QHash<QString, QString> kTable = {
+    {"SA", "tbQuotas_Socios"}, {"SI", "tbQuotas_Socios_Inactivos"}, {"A", "tbQuotas_Movimentos"},
+    {"I", "tbQuotas_Movimentos_Inactivos"}, {"H", "tbQuotas_Movimentos_Historico"}};
 
-struct Amounts {
-    QVariant rend1;
-    QVariant rend2;
-    QVariant quota;
-    QVariant pago;
-};
-
-// Adds a movement and returns its quota_id. Every movement gets a month of
-// its own, so the active table's one-due-a-month rule never trips.
-inline int addMovement(Connection& c, const QString& table, int socio, const Amounts& a)
+// Accounts get ult_ano 2003 and nothing else; every movement a month of its
+// own, so the active table's one-due-a-month rule never trips.
+inline void insertRows(Connection& c, const QStringList& lines)
 {
     static int next = 0;
-    const int n = next++;
-    const int month = 1 + n % 12;
-    const int year = 2000 + n / 12;
-    c.execute(QStringLiteral("INSERT INTO %1 (socio_id, data, ano, mes, tipo, ref, quota_no, rend1, rend2, quota, pago) "
-                             "VALUES (?, ?, ?, ?, 1, 'Sindicato', ?, ?, ?, ?, ?)")
-                  .arg(table),
-              {socio, QDate(year, month, 1), year, month, n, a.rend1, a.rend2, a.quota, a.pago});
-    return c.scalar(QStringLiteral("SELECT MAX(quota_id) FROM %1").arg(table)).toInt();
-}
-
-inline int addMovement(Connection& c, const QString& table, int socio, double quota, double pago)
-{
-    return addMovement(c, table, socio, {1000.0, 0.0, quota, pago});
-}
-
-inline void addAccount(Connection& c, const QString& table, int socio, double totalQuotas, double totalPago)
-{
-    c.execute(QStringLiteral("INSERT INTO %1 (socio_id, ult_ano, ult_mes, ult_rend1, total_quotas, total_pago) "
-                             "VALUES (?, 2003, 5, 1234.5, ?, ?)")
-                  .arg(table),
-              {socio, totalQuotas, totalPago});
-}
-
-struct Totals {
-    bool exists = false;
-    double quotas = 0;
-    double pago = 0;
-};
-
-inline Totals totalsOf(Connection& c, const QString& table, int socio)
-{
-    Totals t;
-    const QVariant count = c.scalar(QStringLiteral("SELECT COUNT(*) FROM %1 WHERE socio_id = ?").arg(table), {socio});
-    t.exists = count.toInt() > 0;
-    if (t.exists) {
-        t.quotas = c.scalar(QStringLiteral("SELECT total_quotas FROM %1 WHERE socio_id = ?").arg(table), {socio}).toDouble();
-        t.pago = c.scalar(QStringLiteral("SELECT total_pago FROM %1 WHERE socio_id = ?").arg(table), {socio}).toDouble();
-    }
-    return t;
-}
-
-// Balances compare at cent precision: SQLite keeps REALs.
-inline bool sameCents(double a, double b)
-{
-    return qint64(std::llround(a * 100)) == qint64(std::llround(b * 100));
-}
-
-// Notes every UPDATE of a movement table in "written" (table, quota_id), to
-// tell which rows a run rewrote.
-inline void noteWrites(Connection& c)
-{
-    const QStringList tables = {QStringLiteral("tbQuotas_Movimentos"), QStringLiteral("tbQuotas_Movimentos_Inactivos"),
-                                QStringLiteral("tbQuotas_Movimentos_Historico")};
-    c.execute(QStringLiteral("CREATE TABLE IF NOT EXISTS written (tbl VARCHAR(60), id INTEGER)"));
-    if (c.engine() == Engine::PostgreSQL)
-        c.execute(QStringLiteral("CREATE OR REPLACE FUNCTION note_write() RETURNS trigger AS $$ BEGIN "
-                                 "INSERT INTO written VALUES (TG_TABLE_NAME, NEW.quota_id); RETURN NEW; END $$ "
-                                 "LANGUAGE plpgsql"));
-    for (const QString& t : tables) {
-        if (c.engine() == Engine::SQLite)
-            c.execute(QStringLiteral("CREATE TRIGGER IF NOT EXISTS w_%1 AFTER UPDATE ON %1 BEGIN "
-                                     "INSERT INTO written VALUES ('%1', NEW.quota_id); END")
-                          .arg(t));
+    for (const QString& line : lines) {
+        const QStringList f = line.split(u' ');
+        QVariantList v = {f[1].toInt()};
+        for (const QString& x : f.mid(2))
+            v << (x == u'-' ? QVariant(QMetaType::fromType<double>()) : QVariant(x.toDouble()));
+        const int n = next++;
+        if (f[0].startsWith(u'S'))
+            c.execute(QStringLiteral("INSERT INTO %1 (socio_id, ult_ano, total_quotas, total_pago) VALUES (?, 2003, ?, ?)")
+                          .arg(kTable[f[0]]), v);
         else
-            c.execute(QStringLiteral("CREATE OR REPLACE TRIGGER w_%1 AFTER UPDATE ON %1 FOR EACH ROW "
-                                     "EXECUTE FUNCTION note_write()")
-                          .arg(t));
-    }
-    c.execute(QStringLiteral("DELETE FROM written"));
-}
-
-inline int writesOf(Connection& c, const QString& table, int quotaId)
-{
-    return c.scalar(QStringLiteral("SELECT COUNT(*) FROM written WHERE LOWER(tbl) = LOWER(?) AND id = ?"),
-                    {table, quotaId})
-        .toInt();
-}
-
-inline int movementWrites(Connection& c)
-{
-    return c.scalar(QStringLiteral("SELECT COUNT(*) FROM written")).toInt();
-}
-
-// Makes every UPDATE of a table fail where the condition (on NEW) holds:
-// a database failure in the middle of a pass.
-inline void failUpdates(Connection& c, const QString& table, const QString& condition)
-{
-    if (c.engine() == Engine::SQLite) {
-        c.execute(QStringLiteral("CREATE TRIGGER simulated_failure BEFORE UPDATE ON %1 WHEN %2 BEGIN "
-                                 "SELECT RAISE(ABORT, 'falha simulada'); END")
-                      .arg(table, condition));
-    } else {
-        c.execute(QStringLiteral("CREATE OR REPLACE FUNCTION simulated_failure() RETURNS trigger AS $$ BEGIN "
-                                 "IF %1 THEN RAISE EXCEPTION 'falha simulada'; END IF; RETURN NEW; END $$ "
-                                 "LANGUAGE plpgsql")
-                      .arg(condition));
-        c.execute(QStringLiteral("CREATE TRIGGER simulated_failure BEFORE UPDATE ON %1 FOR EACH ROW "
-                                 "EXECUTE FUNCTION simulated_failure()")
-                      .arg(table));
+            c.execute(QStringLiteral("INSERT INTO %1 (socio_id, data, ano, mes, quota_no, tipo, ref, rend1, rend2, quota, pago) "
+                                     "VALUES (?, ?, ?, ?, ?, 1, 'Sindicato', ?, ?, ?, ?)").arg(kTable[f[0]]),
+                      QVariantList{v[0], QDate(2000 + n / 12, 1 + n % 12, 1), 2000 + n / 12, 1 + n % 12, n}
+                          + (v.size() == 3 ? QVariantList{1000.0, 0.0} : QVariantList()) + v.mid(1));
     }
 }
 
-inline void stopFailing(Connection& c, const QString& table)
+// What the maintenance may change, in the same notation, accounts first:
+// "SA member total_quotas total_pago ult_ano" and "A member rend1 rend2 quota
+// pago". Numbers show as stored, so a stray fraction of a cent shows too.
+inline QStringList stateOf(Connection& c)
 {
-    if (c.engine() == Engine::SQLite)
-        c.execute(QStringLiteral("DROP TRIGGER IF EXISTS simulated_failure"));
-    else
-        c.execute(QStringLiteral("DROP TRIGGER IF EXISTS simulated_failure ON %1").arg(table));
+    QStringList rows;
+    for (const QString key : {"SA", "SI", "A", "I", "H"}) {
+        Recordset rs;
+        rs.open((key.startsWith(u'S') ? QStringLiteral("SELECT socio_id, total_quotas, total_pago, ult_ano FROM %1 ORDER BY socio_id")
+                                      : QStringLiteral("SELECT socio_id, rend1, rend2, quota, pago FROM %1 ORDER BY quota_id"))
+                    .arg(kTable[key]), c);
+        for (; !rs.eof(); rs.moveNext()) {
+            QString row = key;
+            for (int i = 0; i < rs.fieldCount(); ++i)
+                row += u' ' + (rs.value(i).isNull() ? QStringLiteral("-")
+                                                     : QString::number(rs.value(i).toDouble(), 'g', QLocale::FloatingPointShortest));
+            rows << row;
+        }
+    }
+    return rows;
+}
+
+// Makes every UPDATE of a table fail where the condition (on OLD and NEW)
+// holds, as a database failure in the middle of a pass would; no condition
+// ends it. Triggers of another name stand beside it.
+inline void failUpdates(Connection& c, const QString& table, const QString& condition = {},
+                        const QString& name = QStringLiteral("fail"))
+{
+    const bool lite = c.engine() == Engine::SQLite;
+    const QString trigger = name + u'_' + table;
+    c.execute(QStringLiteral("DROP TRIGGER IF EXISTS ") + trigger + (lite ? QString() : QStringLiteral(" ON ") + table));
+    if (!condition.isEmpty() && lite)
+        c.execute(QStringLiteral("CREATE TRIGGER %1 BEFORE UPDATE ON %2 WHEN %3 BEGIN SELECT RAISE(ABORT, 'falha simulada'); END")
+                      .arg(trigger, table, condition));
+    if (!condition.isEmpty() && !lite) {
+        c.execute(QStringLiteral("CREATE OR REPLACE FUNCTION %1() RETURNS trigger AS $$ BEGIN IF %2 THEN "
+                                 "RAISE EXCEPTION 'falha simulada'; END IF; RETURN NEW; END $$ LANGUAGE plpgsql").arg(trigger, condition));
+        c.execute(QStringLiteral("CREATE TRIGGER %1 BEFORE UPDATE ON %2 FOR EACH ROW EXECUTE FUNCTION %1()").arg(trigger, table));
+    }
 }
 
 }  // namespace quotas::test

@@ -1,17 +1,26 @@
 #pragma once
 
-// Shared by the record window's tests: rows in the test database, and the
-// window opened through General::Registo with a script run while it is modal.
+// Shared by the record window's tests and the host's: a test database with
+// members 1 and 2, rows added and read back as text, and the record window
+// opened through General::Registo with a script run while it is modal.
 
 #include "component/general.h"
+#include "component/shared_objects.h"
 #include "platform/errors.h"
 #include "record/frm_quota.h"
 #include "support/scripted_boxes.h"
 #include "support/test_database.h"
 
+#include <QApplication>
+#include <QDate>
 #include <QLineEdit>
+#include <QPointer>
 #include <QPushButton>
-#include <functional>
+#include <QSqlQuery>
+#include <QTest>
+#include <QTimer>
+
+using namespace Qt::StringLiterals;
 
 namespace quotas::test {
 
@@ -20,40 +29,9 @@ struct MovementRow {
     QVariant rend2 = 0.0;
     QVariant quota = 15.0;
     QVariant pago = 0.0;
-    QString ref = QStringLiteral("Sindicato");
+    QString ref = u"Sindicato"_s;
     int ano = 2003;
     int mes = 3;
-};
-
-class RecordFixture {
-public:
-    explicit RecordFixture(TestDatabase& db) : m_db(db) {}
-
-    // Member `id` ("T<id>", "Maria João Conceição <id>", "Mimi").
-    void addMember(int id);
-    QVariant addMovement(int socio, const MovementRow& row);  // its quota_id
-    // Last values 2001/11, rend 1 and 2, union due 3 (rate 0.5), insurance 4 (0.25).
-    void addAccount(int socio, double totalQuotas, double totalPago);
-
-    QVariant movement(const QVariant& quotaId, const QString& column);
-    QVariant account(int socio, const QString& column);
-    bool hasAccount(int socio);
-    static QString movementsOf(int socio);
-
-    // Registo on the member's movements at pkey; script runs once the window
-    // is up and refreshed, and the close control shuts it if left open.
-    // False when no window showed.
-    bool open(int socio, const QVariant& pkey, const std::function<void(FrmQuota&)>& script, QObject* caller = nullptr);
-
-    // Focus into a field and typing over what entering selected; Tab out.
-    static void type(QLineEdit* field, const QString& text);
-    static void tabOut(QWidget* field);
-    static void click(QPushButton* button);
-
-    General general;
-
-private:
-    TestDatabase& m_db;
 };
 
 class RecordingCaller : public QObject {
@@ -65,7 +43,128 @@ public:
     {
         keys << key;
         if (fail)
-            throw QuotasError(QStringLiteral("falhou"));
+            throw QuotasError(u"falhou"_s);
+    }
+};
+
+// The base of the test objects: every test function starts on an empty
+// database holding members 1 and 2 ("T1", "Maria João Conceição 1", "Mimi").
+class RecordTest : public QObject {
+    Q_OBJECT
+protected slots:
+    void initTestCase()
+    {
+        db = std::make_unique<TestDatabase>();
+        db->login();
+    }
+    void cleanupTestCase() { releaseShared(); }
+    void init()
+    {
+        db->clear();
+        db->connection().execute(u"INSERT INTO tbSocios (socio_id, no_tap, nome, nome_guerra) VALUES "
+                                 "(1, 'T1', 'Maria João Conceição 1', 'Mimi'), (2, 'T2', 'Rui 2', 'Rui')"_s);
+    }
+
+protected:
+    std::unique_ptr<TestDatabase> db;
+
+    QVariant addMovement(int socio, const MovementRow& r)  // its quota_id
+    {
+        db->connection().execute(u"INSERT INTO tbQuotas_Movimentos (socio_id, data, ano, mes, tipo, ref, quota_no, rend1, "
+                                 "rend2, quota, pago) VALUES (?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?)"_s,
+                                 {socio, QDate(r.ano, r.mes, 5), r.ano, r.mes, r.ref == "Sindicato"_L1 ? 1 : 2, r.ref,
+                                  700 + r.mes, r.rend1, r.rend2, r.quota, r.pago});
+        return db->connection().scalar(u"SELECT max(quota_id) FROM tbQuotas_Movimentos"_s);
+    }
+    // Last values 2001/11, rend 1 and 2, union due 3 (rate 0.5), insurance 4 (0.25).
+    void addAccount(int socio, double totalQuotas, double totalPago)
+    {
+        db->connection().execute(u"INSERT INTO tbQuotas_Socios (socio_id, ult_ano, ult_mes, ult_rend1, ult_rend2, "
+                                 "ult_quota_sindicato, ult_perc_sindicato, ult_quota_seguro, ult_perc_seguro, total_quotas, "
+                                 "total_pago) VALUES (?, 2001, 11, 1.0, 2.0, 3.0, 0.5, 4.0, 0.25, ?, ?)"_s,
+                                 {socio, totalQuotas, totalPago});
+    }
+
+    // The columns that spec names ("pago=4; doc_no=R"), read from the row in
+    // the same form, numbers as plain decimals; "none" when there is no row.
+    QString read(const QString& table, const QString& key, const QVariant& id, const QString& spec)
+    {
+        QStringList columns;
+        for (const QString& part : spec.split(u"; "_s))
+            columns << part.section(u'=', 0, 0);
+        Connection& c = db->connection();
+        const QString select = spec == "none"_L1 ? key : columns.join(u',');
+        QSqlQuery& q = c.run(c.dialect().translate(u"SELECT %1 FROM %2 WHERE %3 = ?"_s.arg(select, table, key)), {id});
+        QStringList values;
+        for (int i = 0; i < columns.size() && (i > 0 || q.next()); ++i) {
+            bool number = false;
+            const double d = q.value(i).toDouble(&number);
+            values << columns[i] + u'=' + (q.value(i).isNull() ? u"null"_s : number ? QString::number(d, 'g', 12) : q.value(i).toString());
+        }
+        q.finish();
+        return values.isEmpty() ? u"none"_s : values.join(u"; "_s);
+    }
+    QString movement(const QVariant& id, const QString& spec) { return read(u"tbQuotas_Movimentos"_s, u"quota_id"_s, id, spec); }
+    QString account(int socio, const QString& spec) { return read(u"tbQuotas_Socios"_s, u"socio_id"_s, socio, spec); }
+    static QString movementsOf(int socio)
+    {
+        return u"SELECT tbQuotas_Movimentos.*, tbSocios.no_tap, tbSocios.nome, tbSocios.nome_guerra FROM tbQuotas_Movimentos "
+               "INNER JOIN tbSocios ON tbQuotas_Movimentos.socio_id = tbSocios.socio_id "
+               "WHERE tbQuotas_Movimentos.socio_id = %1 ORDER BY ano, mes, tipo"_s.arg(socio);
+    }
+
+    // Runs script on the record window that opener brings up, once it is
+    // refreshed, and closes it with the close control if still open. False
+    // when no window showed.
+    static bool drive(const std::function<void()>& opener, const std::function<void(FrmQuota&)>& script)
+    {
+        bool ran = false;
+        QTimer poll;
+        QObject::connect(&poll, &QTimer::timeout, [&] {
+            QPointer<FrmQuota> frm = qobject_cast<FrmQuota*>(shared().frmQuota.data());
+            if (ran || !frm || !frm->isVisible() || frm->Timer1->isActive())
+                return;
+            ran = true;
+            poll.stop();
+            QApplication::setActiveWindow(frm);
+            if (!QTest::qWaitForWindowActive(frm))
+                qWarning("the record window did not become active");
+            script(*frm);
+            if (frm && frm->isVisible())
+                frm->close();
+        });
+        poll.start(2);
+        opener();
+        return ran;
+    }
+    // Registo on member 1's movements, positioned on pkey.
+    static bool open(const QVariant& pkey, const std::function<void(FrmQuota&)>& script, QObject* caller = nullptr)
+    {
+        General general;
+        return drive([&] { general.Registo(nullptr, pkey, QString(), movementsOf(1), caller); }, script);
+    }
+
+    // Focus into a field and type over what entering selected.
+    static void type(QLineEdit* field, const QString& text)
+    {
+        field->setFocus(Qt::MouseFocusReason);
+        if (text.isEmpty())
+            QTest::keyClick(field, Qt::Key_Delete);
+        QTest::keyClicks(field, text);
+    }
+    static void tabOut(QWidget* field) { QTest::keyClick(field, Qt::Key_Tab); }
+    static void click(QPushButton* button) { QTest::mouseClick(button, Qt::LeftButton); }
+    // Each box shown as "title (icon) text" or "title [proposed] text", to its first line.
+    static QStringList described(const ScriptedBoxes& boxes)
+    {
+        const char* icons[] = {"", "x", "?", "!", "i"};
+        QStringList out;
+        for (const ShownBox& b : boxes.shown) {
+            const QString mark = b.isInput ? u'[' + b.defaultText + u']'
+                                           : u"(%1%2)"_s.arg(QLatin1String(icons[int(b.icon)]), b.buttons == Buttons::YesNo ? u" yes/no"_s : QString());
+            out << u"%1 %2 %3"_s.arg(b.title, mark, b.text.section(u'\n', 0, 0));
+        }
+        return out;
     }
 };
 

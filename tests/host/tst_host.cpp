@@ -23,9 +23,9 @@ class HostTest : public RecordTest {
 private slots:
     void listsTheMovementsAndTakesBackTheOneThatClosed()
     {
-        const QVariant january = addMovement(1, {1000.0, 0.0, 10.0, 0.0, u"Sindicato"_s, 2003, 1});
-        const QVariant february = addMovement(1, {1000.0, 250.0, 12.5, 0.0, u"Sindicato"_s, 2003, 2});
-        addMovement(2, {});
+        const QVariant january = addMovement({1000.0, 0.0, 10.0, 0.0, u"Sindicato"_s, 2003, 1});
+        const QVariant february = addMovement({1000.0, 250.0, 12.5, 0.0, u"Sindicato"_s, 2003, 2});
+        db->connection().execute(u"UPDATE tbQuotas_Movimentos SET socio_id = 2 WHERE quota_id = ?"_s, {addMovement({})});
         General general;
         host::MainWindow window(general);
         window.refreshMembers();

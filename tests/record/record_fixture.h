@@ -25,13 +25,9 @@ using namespace Qt::StringLiterals;
 namespace quotas::test {
 
 struct MovementRow {
-    QVariant rend1 = 1000.0;
-    QVariant rend2 = 0.0;
-    QVariant quota = 15.0;
-    QVariant pago = 0.0;
+    QVariant rend1 = 1000.0, rend2 = 0.0, quota = 15.0, pago = 0.0;
     QString ref = u"Sindicato"_s;
-    int ano = 2003;
-    int mes = 3;
+    int ano = 2003, mes = 3;
 };
 
 class RecordingCaller : public QObject {
@@ -47,8 +43,16 @@ public:
     }
 };
 
+// Member socio's movements with the member's columns, as the host selects them.
+inline QString movementsOf(int socio)
+{
+    return u"SELECT tbQuotas_Movimentos.*, tbSocios.no_tap, tbSocios.nome, tbSocios.nome_guerra FROM tbQuotas_Movimentos "
+           "INNER JOIN tbSocios ON tbQuotas_Movimentos.socio_id = tbSocios.socio_id "
+           "WHERE tbQuotas_Movimentos.socio_id = %1 ORDER BY ano, mes, tipo"_s.arg(socio);
+}
+
 // The base of the test objects: every test function starts on an empty
-// database holding members 1 and 2 ("T1", "Maria João Conceição 1", "Mimi").
+// database holding members 1 ("T1", "Maria João Conceição 1", "Mimi") and 2.
 class RecordTest : public QObject {
     Q_OBJECT
 protected slots:
@@ -68,35 +72,37 @@ protected slots:
 protected:
     std::unique_ptr<TestDatabase> db;
 
-    QVariant addMovement(int socio, const MovementRow& r)  // its quota_id
+    QVariant addMovement(const MovementRow& r)  // member 1's; returns its quota_id
     {
-        db->connection().execute(u"INSERT INTO tbQuotas_Movimentos (socio_id, data, ano, mes, tipo, ref, quota_no, rend1, "
-                                 "rend2, quota, pago) VALUES (?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?)"_s,
-                                 {socio, QDate(r.ano, r.mes, 5), r.ano, r.mes, r.ref == "Sindicato"_L1 ? 1 : 2, r.ref,
-                                  700 + r.mes, r.rend1, r.rend2, r.quota, r.pago});
+        db->connection().execute(u"INSERT INTO tbQuotas_Movimentos (socio_id, data, ano, mes, tipo, ref, quota_no, rend1, rend2, "
+                                 "quota, pago) VALUES (1, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?)"_s,
+                                 {QDate(r.ano, r.mes, 5), r.ano, r.mes, r.ref == "Sindicato"_L1 ? 1 : 2, r.ref, 700 + r.mes,
+                                  r.rend1, r.rend2, r.quota, r.pago});
         return db->connection().scalar(u"SELECT max(quota_id) FROM tbQuotas_Movimentos"_s);
     }
     // Last values 2001/11, rend 1 and 2, union due 3 (rate 0.5), insurance 4 (0.25).
-    void addAccount(int socio, double totalQuotas, double totalPago)
+    void addAccount(double totalQuotas, double totalPago)
     {
-        db->connection().execute(u"INSERT INTO tbQuotas_Socios (socio_id, ult_ano, ult_mes, ult_rend1, ult_rend2, "
-                                 "ult_quota_sindicato, ult_perc_sindicato, ult_quota_seguro, ult_perc_seguro, total_quotas, "
-                                 "total_pago) VALUES (?, 2001, 11, 1.0, 2.0, 3.0, 0.5, 4.0, 0.25, ?, ?)"_s,
-                                 {socio, totalQuotas, totalPago});
+        db->connection().execute(u"INSERT INTO tbQuotas_Socios (socio_id, ult_ano, ult_mes, ult_rend1, ult_rend2, ult_quota_sindicato, "
+                                 "ult_perc_sindicato, ult_quota_seguro, ult_perc_seguro, total_quotas, total_pago) "
+                                 "VALUES (1, 2001, 11, 1.0, 2.0, 3.0, 0.5, 4.0, 0.25, ?, ?)"_s,
+                                 {totalQuotas, totalPago});
     }
 
-    // The columns that spec names ("pago=4; doc_no=R"), read from the row in
-    // the same form, numbers as plain decimals; "none" when there is no row.
-    QString read(const QString& table, const QString& key, const QVariant& id, const QString& spec)
+    // The columns that spec names ("pago=4; doc_no=R") read from the movement
+    // or from member 1's account, in the same form, numbers as plain decimals;
+    // "none" when there is no row.
+    QString read(const QString& spec, const QVariant& movement = {})
     {
         QStringList columns;
         for (const QString& part : spec.split(u"; "_s))
             columns << part.section(u'=', 0, 0);
         Connection& c = db->connection();
-        const QString select = spec == "none"_L1 ? key : columns.join(u',');
-        QSqlQuery& q = c.run(c.dialect().translate(u"SELECT %1 FROM %2 WHERE %3 = ?"_s.arg(select, table, key)), {id});
+        const QString from = movement.isValid() ? u"tbQuotas_Movimentos WHERE quota_id"_s : u"tbQuotas_Socios WHERE socio_id"_s;
+        QSqlQuery& q = c.run(c.dialect().translate(u"SELECT %1 FROM %2 = ?"_s.arg(spec == "none"_L1 ? u"1"_s : columns.join(u','), from)),
+                             {movement.isValid() ? movement : 1});
         QStringList values;
-        for (int i = 0; i < columns.size() && (i > 0 || q.next()); ++i) {
+        for (int i = 0; i < columns.size() && (i > 0 || q.next()); ++i) {  // nothing when there is no row
             bool number = false;
             const double d = q.value(i).toDouble(&number);
             values << columns[i] + u'=' + (q.value(i).isNull() ? u"null"_s : number ? QString::number(d, 'g', 12) : q.value(i).toString());
@@ -104,15 +110,6 @@ protected:
         q.finish();
         return values.isEmpty() ? u"none"_s : values.join(u"; "_s);
     }
-    QString movement(const QVariant& id, const QString& spec) { return read(u"tbQuotas_Movimentos"_s, u"quota_id"_s, id, spec); }
-    QString account(int socio, const QString& spec) { return read(u"tbQuotas_Socios"_s, u"socio_id"_s, socio, spec); }
-    static QString movementsOf(int socio)
-    {
-        return u"SELECT tbQuotas_Movimentos.*, tbSocios.no_tap, tbSocios.nome, tbSocios.nome_guerra FROM tbQuotas_Movimentos "
-               "INNER JOIN tbSocios ON tbQuotas_Movimentos.socio_id = tbSocios.socio_id "
-               "WHERE tbQuotas_Movimentos.socio_id = %1 ORDER BY ano, mes, tipo"_s.arg(socio);
-    }
-
     // Runs script on the record window that opener brings up, once it is
     // refreshed, and closes it with the close control if still open. False
     // when no window showed.
@@ -125,7 +122,6 @@ protected:
             if (ran || !frm || !frm->isVisible() || frm->Timer1->isActive())
                 return;
             ran = true;
-            poll.stop();
             QApplication::setActiveWindow(frm);
             if (!QTest::qWaitForWindowActive(frm))
                 qWarning("the record window did not become active");
@@ -148,20 +144,18 @@ protected:
     static void type(QLineEdit* field, const QString& text)
     {
         field->setFocus(Qt::MouseFocusReason);
-        if (text.isEmpty())
-            QTest::keyClick(field, Qt::Key_Delete);
+        QTest::keyClick(field, Qt::Key_Delete);
         QTest::keyClicks(field, text);
     }
-    static void tabOut(QWidget* field) { QTest::keyClick(field, Qt::Key_Tab); }
     static void click(QPushButton* button) { QTest::mouseClick(button, Qt::LeftButton); }
-    // Each box shown as "title (icon) text" or "title [proposed] text", to its first line.
+    // Each box shown as "title (icon, yes/no) text" or "title [proposed text] text", to its first line.
     static QStringList described(const ScriptedBoxes& boxes)
     {
-        const char* icons[] = {"", "x", "?", "!", "i"};
+        const char* icons[] = {"", "critical", "question", "exclamation", "information"};
         QStringList out;
         for (const ShownBox& b : boxes.shown) {
             const QString mark = b.isInput ? u'[' + b.defaultText + u']'
-                                           : u"(%1%2)"_s.arg(QLatin1String(icons[int(b.icon)]), b.buttons == Buttons::YesNo ? u" yes/no"_s : QString());
+                                           : u"(%1%2)"_s.arg(QLatin1String(icons[int(b.icon)]), b.buttons == Buttons::YesNo ? ", yes/no"_L1 : ""_L1);
             out << u"%1 %2 %3"_s.arg(b.title, mark, b.text.section(u'\n', 0, 0));
         }
         return out;

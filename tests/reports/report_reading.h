@@ -10,7 +10,8 @@
 #include <QPrintPreviewWidget>
 #include <QTest>
 #include <QTimer>
-#include <algorithm>
+
+using namespace Qt::StringLiterals;
 
 namespace quotas::test {
 
@@ -27,24 +28,21 @@ inline std::vector<const PlacedItem*> placed(const ReportDocument& doc, const QS
     return found;
 }
 
-inline QStringList textsNamed(const ReportDocument& doc, const QString& name)
+// The texts of the items of those names side by side, "a|b|c", one line per
+// item of the first name (per detail, per letter).
+inline QStringList texts(const ReportDocument& doc, const QStringList& names)
 {
-    QStringList texts;
-    for (const PlacedItem* item : placed(doc, name))
-        texts << item->text;
-    return texts;
-}
-
-// The texts of several items side by side, one "a|b|c" line per detail.
-inline QStringList rowsOf(const ReportDocument& doc, const QStringList& names)
-{
-    QStringList rows = textsNamed(doc, names.front());
-    for (const QString& name : names.mid(1)) {
-        const QStringList column = textsNamed(doc, name);
-        for (int i = 0; i < rows.size(); ++i)
-            rows[i] += u'|' + column.value(i, QStringLiteral("?"));
+    QStringList lines;
+    for (int n = 0; n < names.size(); ++n) {
+        const auto items = placed(doc, names[n]);
+        for (int i = 0; i < int(items.size()); ++i) {
+            if (n == 0)
+                lines << items[i]->text;
+            else if (i < lines.size())
+                lines[i] += u'|' + items[i]->text;
+        }
     }
-    return rows;
+    return lines;
 }
 
 inline QList<int> countsPerPage(const ReportDocument& doc, const QString& name)
@@ -55,45 +53,19 @@ inline QList<int> countsPerPage(const ReportDocument& doc, const QString& name)
     return counts;
 }
 
-inline QList<int> tops(const ReportDocument& doc, const QString& name)
-{
-    QList<int> found;
-    for (const PlacedItem* item : placed(doc, name))
-        found << item->rect.top();
-    return found;
-}
-
-// The first item of that name as "text | left,top widthxheight | font | alignment", placed
-// from the report's left edge and from top.
+// The first item of that name as "text | left,top widthxheight | font | alignment",
+// placed from the report's left edge and from top.
 inline QString describe(const ReportDocument& doc, const QString& name, int top)
 {
     const auto found = placed(doc, name);
     if (found.empty())
-        return QStringLiteral("no item ") + name;
+        return u"no item "_s + name;
     const PlacedItem& p = *found.front();
     const ReportFont& f = p.item->font;
     const QRect r = p.rect.translated(-PaperSetup::leftMargin(*doc.layout), -top);
     const char* aligns[] = {"left", "center", "right"};
-    return QStringLiteral("%1 | %2,%3 %4x%5 | %6 %7%8%9 | %10")
-        .arg(p.text).arg(r.left()).arg(r.top()).arg(r.width()).arg(r.height())
+    return u"%1 | %2,%3 %4x%5 | %6 %7%8%9 | %10"_s.arg(p.text).arg(r.left()).arg(r.top()).arg(r.width()).arg(r.height())
         .arg(f.family).arg(f.pointSize).arg(f.bold ? " bold" : "", f.italic ? " italic" : "", aligns[int(p.item->align)]);
-}
-
-// Every text on a page, top to bottom and left to right.
-inline QStringList pageTexts(const ReportPage& page)
-{
-    std::vector<const PlacedItem*> items;
-    for (const PlacedItem& item : page.items) {
-        if (!item.text.isEmpty())
-            items.push_back(&item);
-    }
-    std::stable_sort(items.begin(), items.end(), [](const PlacedItem* a, const PlacedItem* b) {
-        return std::pair(a->rect.top(), a->rect.left()) < std::pair(b->rect.top(), b->rect.left());
-    });
-    QStringList texts;
-    for (const PlacedItem* item : items)
-        texts << item->text;
-    return texts;
 }
 
 // Closes every modal print preview as soon as it is on screen, with the

@@ -12,7 +12,6 @@
 #include "support/test_database.h"
 
 #include <QApplication>
-#include <QDate>
 #include <QLineEdit>
 #include <QPointer>
 #include <QPushButton>
@@ -148,7 +147,8 @@ protected:
         QTest::keyClicks(field, text);
     }
     static void click(QPushButton* button) { QTest::mouseClick(button, Qt::LeftButton); }
-    // Each box shown as "title (icon, yes/no) text" or "title [proposed text] text", to its first line.
+    // Each box as "title (icon, yes/no) text" or "title [proposed text] text", to the text's first line,
+    // with "(another user)" when the rest names another user.
     static QStringList described(const ScriptedBoxes& boxes)
     {
         const char* icons[] = {"", "critical", "question", "exclamation", "information"};
@@ -156,7 +156,7 @@ protected:
         for (const ShownBox& b : boxes.shown) {
             const QString mark = b.isInput ? u'[' + b.defaultText + u']'
                                            : u"(%1%2)"_s.arg(QLatin1String(icons[int(b.icon)]), b.buttons == Buttons::YesNo ? ", yes/no"_L1 : ""_L1);
-            out << u"%1 %2 %3"_s.arg(b.title, mark, b.text.section(u'\n', 0, 0));
+            out << u"%1 %2 %3%4"_s.arg(b.title, mark, b.text.section(u'\n', 0, 0), b.text.contains(u"outro utilizador"_s) ? u" (another user)"_s : QString());
         }
         return out;
     }

@@ -1,7 +1,14 @@
 // The record window driven as a user drives it: what it shows, editing the
-// due's inputs with each refusal keeping the focus, and the key handed back.
+// due's inputs with each refusal keeping the focus, and every way the work on
+// a movement ends (Sair's save step, the close control, a payment, a
+// cancellation), also with a second user on the same rows and a database
+// that fails, and the key handed back to the caller.
 
+#include "platform/recordset.h"
+#include "record/movement_saving.h"
 #include "record_fixture.h"
+
+#include <thread>
 
 using namespace quotas;
 using namespace quotas::test;
@@ -9,18 +16,49 @@ using namespace quotas::test;
 namespace {
 const QString invalid = u"Quotas (information) Tem de introduzir um valor válido neste campo."_s;
 const QString belowPaid = u"Quotas (information) Este valor não é válido porque resultou numa quota inferior à parte já liquidada."_s;
+const QString amountBox = u"Pagamento [10] Digite a importância a liquidar."_s;
+const QString documentBox = u"Tipo de Documento [] Indique o documento comprovativo de pagamento da quota:"_s;
+const QString overBox = u"Pagamento (question, yes/no) A importância de € %1 é superior ao valor por liquidar (€ 10.00)."_s;
+const QString question = u"Quotizações (question, yes/no) Quer eliminar este registo?"_s;
+const QString lastValues = u"ult_ano=%1; ult_mes=%2; ult_rend1=700; ult_rend2=300.1; ult_quota_sindicato=%3; ult_perc_sindicato=%4; "
+                            "ult_quota_seguro=%5; ult_perc_seguro=%6; total_quotas=%7; total_pago=%8"_s;
 
 struct Edit {
     MovementRow row;
-    const char* field;  // "" only shows the movement
-    const char* typed;
-    QString message;               // the refusal, if any
-    double quota;                  // the due then
-    QStringList shown;             // rend1, participation, unpaid part
+    const char *field, *typed;  // no field: the movement as it opens
+    QString message;            // the refusal, if any
+    double quota;               // the due then
+    QStringList shown;          // rend1, participation, unpaid part
     const char* locale = "C";
 };
+
+struct Ending {
+    const char* button;  // or "close", the close control
+    MovementRow row;
+    bool hasAccount;     // 50 charged, 20 paid
+    const char* rend1;   // typed first when given
+    QStringList inputs;  // a null text cancels the box
+    Answer answer;       // to the one Yes/No question
+    QStringList boxes;
+    bool closes;
+    QString movement, account;  // as read() gives them
+    // "another user" pays 6 once the window is up; the "database down" as the last box shows, back for a final Sair.
+    const char* disturbance = "";
+    const char* caller = "recording";  // "unknown key" (the window opens on the first row), "none", "silent", "failing"
+};
+
+// Another user paying through the same code on a connection of their own.
+void pay(Connection& connection, const QVariant& quotaId, double amount)
+{
+    Recordset rows;
+    rows.open(movementsOf(1), connection, Cursor::Dynamic, Lock::Optimistic);
+    if (!rows.find(u"quota_id"_s, quotaId))
+        throw QuotasError(u"no such movement"_s);
+    liquidarQuota(rows, amount, u"B"_s);
+}
 }  // namespace
 Q_DECLARE_METATYPE(Edit)
+Q_DECLARE_METATYPE(Ending)
 
 class RecordWindowTest : public RecordTest {
     Q_OBJECT
@@ -31,8 +69,7 @@ private slots:
     {
         QTest::addColumn<Edit>("edit");
         const MovementRow base{100.0, 200.0, 3.0, 0.0};  // participation 0.01
-        const MovementRow paid15{100.0, 200.0, 3.0, 15.0};
-        const MovementRow quarter{40.0, 0.0, 10.0, 12.0};  // participation 0.25
+        const MovementRow paid15{100.0, 200.0, 3.0, 15.0}, quarter{40.0, 0.0, 10.0, 12.0}, one{1.0, 0.0, 0.25, 0.0};
         const MovementRow portuguese{1234.5, 0.0, 18.52, 30.0, u"Seguro"_s, 2004, 12};
         const auto row = [](const char* tag, const Edit& e) { QTest::newRow(tag) << e; };
         row("part paid", {{600.0, 200.0, 10.0, 4.0}, "", "", {}, 10.0, {"€ 600.00", "0.0125", "€ 6.00"}});
@@ -50,8 +87,9 @@ private slots:
         row("second remuneration", {base, "Text6", "900", {}, 10.0, {"€ 100.00", "0.01", "€ 10.00"}});
         row("equal to the paid part", {quarter, "Text5", "48", {}, 12.0, {"€ 48.00", "0.25", "€ 0.00"}});
         row("unrounded product compared", {quarter, "Text5", "47.99", belowPaid, 10.0, {"47.99", "0.25", "(€ 2.00)"}});
-        row("tie to even cent, down", {{1.0, 0.0, 0.25, 0.0}, "Text5", "0.50", {}, 0.12, {"€ 0.50", "0.25", "€ 0.12"}});
-        row("tie to even cent, up", {{1.0, 0.0, 0.25, 0.0}, "Text5", "1.50", {}, 0.38, {"€ 1.50", "0.25", "€ 0.38"}});
+        // The due follows, in whole cents, half to even; the participation stays.
+        row("tie to even cent, down", {one, "Text5", "0.50", {}, 0.12, {"€ 0.50", "0.25", "€ 0.12"}});
+        row("tie to even cent, up", {one, "Text5", "1.50", {}, 0.38, {"€ 1.50", "0.25", "€ 0.38"}});
         // Single precision would make this 1234567.88.
         row("large amount keeps its cents", {{1.0, 0.0, 1.0, 0.0}, "Text5", "1234567.89", {}, 1234567.89, {"€ 1,234,567.89", "1", "€ 1,234,567.89"}});
         row("participation", {base, "Text8", "0.02", {}, 6.0, {"€ 100.00", "0.02", "€ 6.00"}});
@@ -71,11 +109,9 @@ private slots:
             const MovementRow& r = edit.row;
             QCOMPARE((QStringList{frm.windowTitle(), frm.Text1->text(), frm.Text2->text(), frm.Text3->text(), frm.Text4->text(),
                                   frm.Text7->text(), frm.Text10->text(), frm.Text11->text(), frm.Text12->text()}),
-                     (QStringList{"Quota", r.ano == 2004 ? "05-dez-2004" : "05-mar-2003",
-                                  QString::number(r.ano), QString::number(r.mes), QString::number(700 + r.mes), r.ref, "T1",
-                                  "Maria João Conceição 1", "Mimi"}));
-            auto* field = frm.findChild<QLineEdit*>(QString::fromLatin1(edit.field));
-            if (field) {
+                     (QStringList{"Quota", r.ano == 2004 ? "05-dez-2004" : "05-mar-2003", QString::number(r.ano), QString::number(r.mes),
+                                  QString::number(700 + r.mes), r.ref, "T1", "Maria João Conceição 1", "Mimi"}));
+            if (auto* field = frm.findChild<QLineEdit*>(QString::fromLatin1(edit.field))) {
                 type(field, QString::fromUtf8(edit.typed));
                 QTest::keyClick(field, Qt::Key_Tab);
                 // A refusal keeps the focus, before and after its message.
@@ -106,34 +142,142 @@ private slots:
         QCOMPARE(boxes.shown.size(), 0);
     }
 
-    void closingHandsTheKeyToTheCaller_data()
+    void endsTheWorkOnAMovement_data()
     {
-        QTest::addColumn<QString>("caller");
-        QTest::addColumn<bool>("known");  // the host's key is among the rows
-        QTest::newRow("on the host's movement") << "recording" << true;
-        QTest::newRow("unknown key: first row") << "recording" << false;
-        QTest::newRow("no caller") << "none" << true;
-        QTest::newRow("caller without RemoteKey") << "silent" << true;
-        QTest::newRow("RemoteKey fails") << "failing" << true;
+        QTest::addColumn<Ending>("e");
+        const auto row = [](const char* tag, const Ending& e) { QTest::newRow(tag) << e; };
+        // An older movement than the member's last: Sair carries its values all the same.
+        MovementRow older{500.0, 300.1, 12.0, 0.1, u"Sindicato"_s, 2002, 7}, insurance = older, otherCase = older;
+        insurance.ref = u"Seguro"_s;
+        otherCase.ref = u"sindicato"_s;
+        const QString saved = u"rend1=700; quota=15"_s, rate = u"0.01499850015"_s;  // (700 + 300.1) x 0.015; 15 / 1000.1
+        const QString intoInsurance = lastValues.arg(2001).arg(11).arg(3).arg(0.5).arg(15).arg(rate).arg(50).arg(20);
+        row("Sair, new account", {"Command3", older, false, "700", {}, {}, {}, true, saved, lastValues.arg(2002).arg(7).arg(15).arg(rate, u"null"_s, u"null"_s).arg(0).arg(0)});
+        row("Sair, existing account", {"Command3", older, true, "700", {}, {}, {}, true, saved, lastValues.arg(2001).arg(11).arg(15).arg(rate).arg(4).arg(0.25).arg(50).arg(20)});
+        row("Sair, insurance", {"Command3", insurance, true, "700", {}, {}, {}, true, saved, intoInsurance});
+        row("Sair, another letter case is insurance", {"Command3", otherCase, true, "700", {}, {}, {}, true, saved, intoInsurance});
+        row("Sair without remunerations writes rate 0", {"Command3", {0.0, 0.0, 7.5, 0.0}, false, "", {}, {}, {}, true, u"quota=7.5"_s, u"ult_quota_sindicato=7.5; ult_perc_sindicato=0"_s});
+        row("Sair first validates the field", {"Command3", {}, false, "abc", {}, {}, {invalid}, false, u"rend1=1000"_s, u"none"_s});
+        row("the close control saves nothing", {"close", {100.0, 200.0, 3.0, 0.0}, false, "1000", {}, {}, {}, true, u"rend1=100; quota=3"_s, u"none"_s});
+
+        const MovementRow due{1000.0, 0.0, 10.0, 0.0};
+        const QStringList asked = {amountBox, documentBox};
+        row("a settled due takes no payment", {"Command2", {1000.0, 0.0, 10.0, 10.0}, true, "", {}, {}, {}, false, u"pago=10"_s, u"total_pago=20"_s});
+        row("4 of 10", {"Command2", due, true, "", {"4", "Recibo 17/2003"}, {}, asked, true, u"quota=10; pago=4; doc_no=Recibo 17/2003"_s, u"ult_rend1=1000; total_quotas=50; total_pago=24"_s});
+        row("document box cancelled", {"Command2", due, true, "", {"4", QString()}, {}, asked, true, u"pago=4; doc_no="_s, u"total_pago=24"_s});
+        row("member without an account", {"Command2", due, false, "", {"4", "R"}, {}, asked, true, u"pago=4; doc_no=R"_s, u"total_quotas=0; total_pago=4"_s});
+        row("0.10 above, as typed", {"Command2", due, true, "", {"10.10", "R"}, {}, asked, true, u"pago=10.1"_s, u"total_pago=30.1"_s});
+        row("more above, confirmed", {"Command2", due, true, "", {"10.11", "R"}, Answer::Yes, {amountBox, overBox.arg(u"10.11"_s), documentBox}, true, u"pago=10.11"_s, u"total_pago=30.11"_s});
+        row("large amount keeps its cents", {"Command2", due, true, "", {"1234567.89", "R"}, Answer::Yes, {amountBox, overBox.arg(u"1,234,567.89"_s), documentBox}, true, u"pago=1234567.89"_s, u"total_pago=1234587.89"_s});
+        // The save step runs once the amount is a number, before a refusal.
+        row("amount box cancelled", {"Command2", due, false, "", {QString()}, {}, {amountBox}, false, u"pago=0"_s, u"none"_s});
+        row("empty amount", {"Command2", due, false, "", {""}, {}, {amountBox}, false, u"pago=0"_s, u"none"_s});
+        row("not a number", {"Command2", due, false, "", {"quatro"}, {}, {amountBox}, false, u"pago=0"_s, u"none"_s});
+        row("zero", {"Command2", due, false, "", {"0"}, {}, {amountBox}, false, u"pago=0"_s, u"total_pago=0"_s});
+        row("negative", {"Command2", due, false, "", {"-4"}, {}, {amountBox}, false, u"pago=0"_s, u"total_pago=0"_s});
+        row("more above, not confirmed", {"Command2", due, false, "", {"10.11"}, Answer::No, {amountBox, overBox.arg(u"10.11"_s)}, false, u"pago=0"_s, u"total_pago=0"_s});
+
+        const MovementRow paid4{1000.0, 0.0, 10.0, 4.0};
+        const QString untouched = u"ult_rend1=1; total_quotas=50; total_pago=20"_s;
+        row("cancellation, yes", {"Command1", paid4, true, "2000", {}, Answer::Yes, {question}, true, u"none"_s, untouched});
+        row("cancellation, no", {"Command1", paid4, true, "2000", {}, Answer::No, {question}, false, u"rend1=1000; pago=4"_s, untouched});
+
+        // Another user's work is never overwritten: a refused save step leaves the account as it was; the payment's own save
+        // step, before its refusal, is final. Once the database is back, the window saves.
+        const QString paidByB = u"rend1=1000; pago=6; doc_no=B"_s, notSaved = u"Quotas (critical) Não foi possível gravar a quota. (another user)"_s;
+        row("Sair after another user's payment", {"Command3", due, true, "1200", {}, {}, {notSaved}, false, paidByB, u"ult_rend1=1; total_pago=26"_s, "another user"});
+        row("payment after another user's", {"Command2", due, true, "", {"4", "A"}, {}, {amountBox, documentBox, u"Quotas (critical) O pagamento não foi registado. (another user)"_s},
+                                             false, paidByB, u"ult_rend1=1000; total_pago=26"_s, "another user"});
+        row("cancellation after another user's payment", {"Command1", due, true, "", {}, Answer::Yes, {question, u"Quotas (critical) Não foi possível eliminar o registo. (another user)"_s},
+                                                          false, paidByB, u"ult_rend1=1; total_pago=26"_s, "another user"});
+        row("Sair, database down", {"Command3", due, true, "1200", {}, {}, {u"Quotas (critical) Não foi possível gravar a quota."_s}, false,
+                                    u"rend1=1200; pago=0"_s, u"ult_rend1=1200; total_pago=20"_s, "database down"});
+        row("payment, database down", {"Command2", due, true, "", {"4", "A"}, {}, {amountBox, documentBox, u"Quotas (critical) O pagamento não foi registado."_s},
+                                       false, u"rend1=1000; pago=0; doc_no=null"_s, u"ult_rend1=1000; total_pago=20"_s, "database down"});
+        row("cancellation, database down", {"Command1", due, true, "", {}, Answer::Yes, {question, u"Quotas (critical) Não foi possível eliminar o registo."_s},
+                                            false, u"rend1=1000; pago=0"_s, u"ult_rend1=1000; total_pago=20"_s, "database down"});
+
+        row("unknown key: the first row", {"Command3", due, false, "", {}, {}, {}, true, u"quota=13.5"_s, u"ult_quota_sindicato=13.5"_s, "", "unknown key"});
+        for (const char* caller : {"none", "silent", "failing"})
+            row(caller, {"Command3", due, false, "", {}, {}, {}, true, u"quota=10"_s, u"ult_quota_sindicato=10"_s, "", caller});
     }
-    void closingHandsTheKeyToTheCaller()
+    void endsTheWorkOnAMovement()
     {
-        QFETCH(QString, caller);
-        QFETCH(bool, known);
-        const QVariant first = addMovement({100.0, 0.0, 1.0, 0.0, u"Sindicato"_s, 2003, 1});
-        const QVariant second = addMovement({100.0, 0.0, 2.0, 0.0, u"Sindicato"_s, 2003, 2});
-        RecordingCaller recording;
-        recording.fail = caller == "failing"_L1;
-        QObject silent;
-        QObject* host = caller == "none"_L1 ? nullptr : caller == "silent"_L1 ? &silent : &recording;
+        QFETCH(Ending, e);
+        const QVariant id = addMovement(e.row), first = addMovement({900.0, 0.0, 13.5, 0.0, u"Sindicato"_s, 2003, 1});
+        if (e.hasAccount)
+            addAccount(50.0, 20.0);
+        const std::unique_ptr<Connection> other = db->openAnother();
+        Connection& connection = Data().SqlServer;
+        const bool down = e.disturbance == "database down"_L1;
         ScriptedBoxes boxes;
-        QVERIFY(open(known ? second : QVariant(second.toLongLong() + 100), [&](FrmQuota& frm) {
-            QCOMPARE(frm.Text3->text(), known ? u"2"_s : u"1"_s);
-            click(frm.Command3);
-            QVERIFY(!frm.isVisible());
-        }, host));
-        QCOMPARE(boxes.shown.size(), 0);
-        QCOMPARE(recording.keys, host == &recording ? QVariantList{known ? second : first} : QVariantList());
+        for (const QString& text : e.inputs)
+            boxes.answerInput(text.isNull() ? std::nullopt : std::optional(text));
+        boxes.answer(e.answer);
+        boxes.onShow = [&](const ShownBox& box) {
+            if (down && (box.title == "Tipo de Documento"_L1 || box.buttons == Buttons::YesNo))
+                connection.close();
+        };
+        RecordingCaller recording;
+        recording.fail = e.caller == "failing"_L1;
+        QObject silent;
+        QObject* caller = e.caller == "none"_L1 ? nullptr : e.caller == "silent"_L1 ? &silent : &recording;
+        const bool unknownKey = e.caller == "unknown key"_L1;
+        QVERIFY(open(unknownKey ? QVariant(id.toLongLong() + 100) : id, [&](FrmQuota& frm) {
+            if (e.disturbance == "another user"_L1)
+                pay(*other, id, 6.0);
+            if (*e.rend1)
+                type(frm.Text5, QString::fromLatin1(e.rend1));
+            if (down && e.button == "Command3"_L1)
+                connection.close();
+            if (e.button == "close"_L1)
+                frm.close();
+            else
+                click(frm.findChild<QPushButton*>(QString::fromLatin1(e.button)));
+            QCOMPARE(frm.isVisible(), !e.closes);
+            if (down) {
+                connection.open();
+                click(frm.Command3);
+            }
+        }, caller));
+        QCOMPARE(described(boxes), e.boxes);
+        QCOMPARE(read(e.movement, unknownKey ? first : id) + u" | "_s + read(e.account), e.movement + u" | "_s + e.account);
+        QCOMPARE(recording.keys, caller == &recording ? QVariantList{unknownKey ? first : id} : QVariantList());  // however it closed
+        QTRY_VERIFY(shared().frmQuota.isNull());  // unloaded: the next Registo builds a fresh one
+    }
+
+    void aPaymentWithoutAnAccountRowCreatesNone()
+    {
+        const QVariant id = addMovement({1000.0, 0.0, 10.0, 2.0});
+        pay(db->connection(), id, 3.0);
+        QCOMPARE(read(u"pago"_s, id) + u" | "_s + read(u"none"_s), u"pago=5 | none"_s);
+    }
+
+    void paymentsRecordedAtTheSameMomentAreAllKept()
+    {
+        // Two users, each paying a due of their own of one account, at once.
+        const QVariant dues[] = {addMovement({1000.0, 0.0, 50.0, 0.0, u"Sindicato"_s, 2003, 1}), addMovement({1000.0, 0.0, 50.0, 0.0})};
+        addAccount(100.0, 0.0);
+        QStringList failures[2];
+        auto user = [&, connectionString = db->connectionString()](int n) {
+            try {
+                Connection own(u"user%1"_s.arg(n));
+                own.setConnectionString(connectionString);
+                own.open();
+                Recordset rows;
+                rows.open(movementsOf(1), own, Cursor::Dynamic, Lock::Optimistic);
+                rows.find(u"quota_id"_s, dues[n]);
+                for (int i = 0; i < 30; ++i)
+                    liquidarQuota(rows, 1.0, QString::number(i));
+            } catch (const QuotasError& e) {
+                failures[n] << e.message();
+            }
+        };
+        std::thread first(user, 0), second(user, 1);
+        first.join();
+        second.join();
+        QCOMPARE(failures[0] + failures[1], QStringList());
+        QCOMPARE(read(u"pago"_s, dues[0]) + read(u"pago"_s, dues[1]) + read(u"total_pago"_s), u"pago=30pago=30total_pago=60"_s);
     }
 };
 

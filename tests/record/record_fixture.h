@@ -122,8 +122,7 @@ protected:
                 return;
             ran = true;
             QApplication::setActiveWindow(frm);
-            if (!QTest::qWaitForWindowActive(frm))
-                qWarning("the record window did not become active");
+            QVERIFY(QTest::qWaitForWindowActive(frm));
             script(*frm);
             if (frm && frm->isVisible())
                 frm->close();

@@ -2,12 +2,14 @@
 // due's inputs with each refusal keeping the focus, and every way the work on
 // a movement ends (Sair's save step, the close control, a payment, a
 // cancellation), also with a second user on the same rows and a database
-// that fails, and the key handed back to the caller.
+// that fails, and the key handed back to the caller, the host among them.
 
+#include "host/main_window.h"
 #include "platform/recordset.h"
 #include "record/movement_saving.h"
 #include "record_fixture.h"
 
+#include <QTableWidget>
 #include <thread>
 
 using namespace quotas;
@@ -25,11 +27,12 @@ const QString lastValues = u"ult_ano=%1; ult_mes=%2; ult_rend1=700; ult_rend2=30
 
 struct Edit {
     MovementRow row;
-    const char *field, *typed;  // no field: the movement as it opens
+    const char *field, *typed;  // no field: the movement as it opens; nothing typed: Tab through the three fields
     QString message;            // the refusal, if any
     double quota;               // the due then
     QStringList shown;          // rend1, participation, unpaid part
     const char* locale = "C";
+    const char* entered = nullptr;  // the field's text on entering, all of it selected
 };
 
 struct Ending {
@@ -47,14 +50,16 @@ struct Ending {
     const char* caller = "recording";  // "unknown key" (the window opens on the first row), "none", "silent", "failing"
 };
 
-// Another user paying through the same code on a connection of their own.
-void pay(Connection& connection, const QVariant& quotaId, double amount)
+// Another user paying through the same code on a connection of their own:
+// times payments of amount, on one reading of the rows.
+void pay(Connection& connection, const QVariant& quotaId, double amount, int times = 1)
 {
     Recordset rows;
     rows.open(movementsOf(1), connection, Cursor::Dynamic, Lock::Optimistic);
     if (!rows.find(u"quota_id"_s, quotaId))
         throw QuotasError(u"no such movement"_s);
-    liquidarQuota(rows, amount, u"B"_s);
+    for (int i = 0; i < times; ++i)
+        liquidarQuota(rows, amount, u"B"_s);
 }
 }  // namespace
 Q_DECLARE_METATYPE(Edit)
@@ -96,6 +101,8 @@ private slots:
         row("participation below paid", {paid15, "Text8", "0.02", {}, 6.0, {"€ 100.00", "0.02", "(€ 9.00)"}});
         row("participation not a number", {base, "Text8", "1%", invalid, 3.0, {"€ 100.00", "1%", "€ 3.00"}});
         row("participation empty", {base, "Text8", "", invalid, 3.0, {"€ 100.00", "", "€ 3.00"}});
+        // An imported due that the shown participation (0.01235) does not give back.
+        row("passing through changes nothing", {{100000.5, 0.0, 1234.57, 0.0}, "Text5", nullptr, {}, 1234.57, {"€ 100,000.50", "0.01235", "€ 1,234.57"}, "C", "100000.5"});
     }
     void showsAndEditsTheDue()
     {
@@ -112,8 +119,13 @@ private slots:
                      (QStringList{"Quota", r.ano == 2004 ? "05-dez-2004" : "05-mar-2003", QString::number(r.ano), QString::number(r.mes),
                                   QString::number(700 + r.mes), r.ref, "T1", "Maria João Conceição 1", "Mimi"}));
             if (auto* field = frm.findChild<QLineEdit*>(QString::fromLatin1(edit.field))) {
-                type(field, QString::fromUtf8(edit.typed));
-                QTest::keyClick(field, Qt::Key_Tab);
+                field->setFocus(Qt::TabFocusReason);
+                if (edit.entered)
+                    QCOMPARE(field->selectedText(), QString::fromLatin1(edit.entered));
+                if (edit.typed)
+                    type(field, QString::fromUtf8(edit.typed));
+                for (QLineEdit* left : edit.typed ? QList{field} : QList{frm.Text5, frm.Text6, frm.Text8})
+                    QTest::keyClick(left, Qt::Key_Tab);
                 // A refusal keeps the focus, before and after its message.
                 QCOMPARE(QApplication::focusWidget() == field, !edit.message.isEmpty());
                 QCOMPARE(focusAtMessage, edit.message.isEmpty() ? nullptr : field);
@@ -123,23 +135,6 @@ private slots:
         }));
         QCOMPARE(described(boxes), edit.message.isEmpty() ? QStringList() : QStringList{edit.message});
         QCOMPARE(read(u"quota"_s, id), u"quota="_s + QString::number(edit.row.quota.toDouble(), 'g', 12));  // nothing saved
-    }
-
-    void passingThroughTheFieldsChangesNothing()
-    {
-        // An imported due that the shown participation (0.01235) does not give back.
-        ScriptedBoxes boxes;
-        QVERIFY(open(addMovement({100000.5, 0.0, 1234.57, 0.0}), [&](FrmQuota& frm) {
-            frm.Text5->setFocus(Qt::TabFocusReason);
-            QCOMPARE(frm.Text5->text(), u"100000.5"_s);  // entering shows the number itself, all of it selected
-            QCOMPARE(frm.Text5->selectedText(), frm.Text5->text());
-            for (QWidget* field : {frm.Text5, frm.Text6, frm.Text8})
-                QTest::keyClick(field, Qt::Key_Tab);
-            QCOMPARE(QApplication::focusWidget(), frm.Text9);
-            QCOMPARE(frm.Adodc1->value(u"quota"_s).toDouble(), 1234.57);
-            QCOMPARE(frm.Text5->text(), u"€ 100,000.50"_s);
-        }));
-        QCOMPARE(boxes.shown.size(), 0);
     }
 
     void endsTheWorkOnAMovement_data()
@@ -256,11 +251,7 @@ private slots:
                 Connection own(u"user%1"_s.arg(n));
                 own.setConnectionString(connectionString);
                 own.open();
-                Recordset rows;
-                rows.open(movementsOf(1), own, Cursor::Dynamic, Lock::Optimistic);
-                rows.find(u"quota_id"_s, dues[n]);
-                for (int i = 0; i < 30; ++i)
-                    liquidarQuota(rows, 1.0, QString::number(i));
+                pay(own, dues[n], 1.0, 30);
             } catch (const QuotasError& e) {
                 failures[n] << e.message();
             }
@@ -270,6 +261,49 @@ private slots:
         second.join();
         QCOMPARE(failures[0] + failures[1], QStringList());
         QCOMPARE(read(u"pago"_s, dues[0]) + read(u"pago"_s, dues[1]) + read(u"total_pago"_s), u"pago=30pago=30total_pago=60"_s);
+    }
+
+    // The stand-in host: a member's movements, one opened by a double click, and the key handed back.
+    void theHostOpensAMovementAndTakesItsKeyBack()
+    {
+        const QVariant january = addMovement({1000.0, 0.0, 10.0, 0.0, u"Sindicato"_s, 2003, 1});
+        const QVariant february = addMovement({1000.0, 250.0, 12.5, 0.0, u"Sindicato"_s, 2003, 2});
+        db->connection().execute(u"UPDATE tbQuotas_Movimentos SET socio_id = 2 WHERE quota_id = ?"_s, {addMovement({})});
+        General general;
+        host::MainWindow window(general);
+        window.refreshMembers();
+        window.show();
+        QVERIFY(QTest::qWaitForWindowExposed(&window));
+        QTableWidget* movements = window.movements();
+        window.members()->setCurrentCell(1, 1);  // T2
+        QCOMPARE(movements->rowCount(), 1);
+        window.members()->setCurrentCell(0, 1);  // T1, its latest movement first
+        QStringList latest;
+        for (int column = 0; column < movements->columnCount(); ++column)
+            latest << movements->item(0, column)->text();
+        QCOMPARE(latest, (QStringList{"05-fev-2003", "2003", "2", "702", "Sindicato", "€ 1,000.00", "€ 250.00", "€ 12.50", "€ 0.00"}));
+
+        // The older one double-clicked (a click, then the double-click event), paid 4 and closed.
+        ScriptedBoxes boxes;
+        boxes.answerInput(u"4"_s);
+        boxes.answerInput(u"R1"_s);
+        const QPoint older = movements->visualItemRect(movements->item(1, 0)).center();
+        QVERIFY(drive([&] {
+            QTest::mouseClick(movements->viewport(), Qt::LeftButton, {}, older);
+            QTest::mouseDClick(movements->viewport(), Qt::LeftButton, {}, older);
+        }, [&](FrmQuota& frm) { click(frm.Command2); }));
+        QCOMPARE(read(u"pago"_s, january), u"pago=4"_s);
+        QCOMPARE(window.currentMovement(), january);  // selected again, both lists refreshed
+        QCOMPARE(movements->item(movements->currentRow(), 8)->text() + window.members()->item(window.members()->currentRow(), 3)->text(),
+                 u"€ 4.00€ 4.00"_s);
+
+        // A key handed back is selected; a cancelled movement is gone from the list, with nothing selected.
+        window.RemoteKey(february);
+        QCOMPARE(window.currentMovement(), february);
+        db->connection().execute(u"DELETE FROM tbQuotas_Movimentos WHERE quota_id = ?"_s, {february});
+        window.RemoteKey(february);
+        QCOMPARE(movements->rowCount(), 1);
+        QVERIFY(!window.currentMovement().isValid());
     }
 };
 

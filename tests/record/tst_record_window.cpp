@@ -50,8 +50,8 @@ public:
 
 // Member 1's movements with the member's columns, as the host selects them.
 const QString memberMovements = u"SELECT tbQuotas_Movimentos.*, tbSocios.no_tap, tbSocios.nome, tbSocios.nome_guerra FROM tbQuotas_Movimentos "
-                          "INNER JOIN tbSocios ON tbQuotas_Movimentos.socio_id = tbSocios.socio_id "
-                          "WHERE tbQuotas_Movimentos.socio_id = 1 ORDER BY ano, mes, tipo"_s;
+                                "INNER JOIN tbSocios ON tbQuotas_Movimentos.socio_id = tbSocios.socio_id "
+                                "WHERE tbQuotas_Movimentos.socio_id = 1 ORDER BY ano, mes, tipo"_s;
 
 const QString invalid = u"Quotas (information) Tem de introduzir um valor válido neste campo."_s;
 const QString belowPaid = u"Quotas (information) Este valor não é válido porque resultou numa quota inferior à parte já liquidada."_s;
@@ -112,8 +112,7 @@ class RecordWindowTest : public QObject {
     {
         db->connection().execute(u"INSERT INTO tbQuotas_Movimentos (socio_id, data, ano, mes, tipo, ref, quota_no, rend1, rend2, "
                                  "quota, pago) VALUES (1, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?)"_s,
-                                 {QDate(r.ano, r.mes, 5), r.ano, r.mes, r.ref == "Sindicato"_L1 ? 1 : 2, r.ref, 700 + r.mes,
-                                  r.rend1, r.rend2, r.quota, r.pago});
+                                 {QDate(r.ano, r.mes, 5), r.ano, r.mes, r.ref == "Sindicato"_L1 ? 1 : 2, r.ref, 700 + r.mes, r.rend1, r.rend2, r.quota, r.pago});
         return db->connection().scalar(u"SELECT max(quota_id) FROM tbQuotas_Movimentos"_s);
     }
     // Last values 2001/11, rend 1 and 2, union due 3 (rate 0.5), insurance 4 (0.25).
@@ -121,21 +120,20 @@ class RecordWindowTest : public QObject {
     {
         db->connection().execute(u"INSERT INTO tbQuotas_Socios (socio_id, ult_ano, ult_mes, ult_rend1, ult_rend2, ult_quota_sindicato, "
                                  "ult_perc_sindicato, ult_quota_seguro, ult_perc_seguro, total_quotas, total_pago) "
-                                 "VALUES (1, 2001, 11, 1.0, 2.0, 3.0, 0.5, 4.0, 0.25, ?, ?)"_s,
-                                 {totalQuotas, totalPago});
+                                 "VALUES (1, 2001, 11, 1.0, 2.0, 3.0, 0.5, 4.0, 0.25, ?, ?)"_s, {totalQuotas, totalPago});
     }
 
-    // The columns that spec names ("pago=4; doc_no=R") read from the movement
-    // or from member 1's account, in the same form, numbers as plain decimals;
-    // "none" when there is no row.
-    QString read(const QString& spec, const QVariant& movement = {})
+    // The columns named in expected ("pago=4; doc_no=R"), read from the movement
+    // or from member 1's account and given in the same form, numbers as plain
+    // decimals; "none" when there is no row.
+    QString read(const QString& expected, const QVariant& movement = {})
     {
         QStringList columns;
-        for (const QString& part : spec.split(u"; "_s))
+        for (const QString& part : expected.split(u"; "_s))
             columns << part.section(u'=', 0, 0);
         Connection& c = db->connection();
         const QString from = movement.isValid() ? u"tbQuotas_Movimentos WHERE quota_id"_s : u"tbQuotas_Socios WHERE socio_id"_s;
-        QSqlQuery& q = c.run(c.dialect().translate(u"SELECT %1 FROM %2 = ?"_s.arg(spec == "none"_L1 ? u"1"_s : columns.join(u','), from)),
+        QSqlQuery& q = c.run(c.dialect().translate(u"SELECT %1 FROM %2 = ?"_s.arg(expected == "none"_L1 ? u"1"_s : columns.join(u','), from)),
                              {movement.isValid() ? movement : 1});
         QStringList values;
         for (int i = 0; i < columns.size() && (i > 0 || q.next()); ++i) {  // nothing when there is no row

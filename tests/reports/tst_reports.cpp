@@ -1,5 +1,5 @@
-// The reports: the banded engine without a database (the fixed formats,
-// where the bands fall, the functions), then the debt listing, the debt
+// The reports: the banded engine without a database (the fixed formats, the
+// date of printing, pagination), then the debt listing, the debt
 // letters and the rejects listing on both engines, read from the pages of the
 // previews that General shows (layout, who is listed and in what order, the
 // totals, the pages, the letters, the reports' connection), and written to
@@ -189,7 +189,6 @@ private slots:
         qputenv("QUOTAS_DATA_DIR", db->scratch(u"data"_s).toUtf8());
         QDir().mkpath(db->scratch(u"data"_s));
     }
-    void cleanupTestCase() { Report::setObserver({}); }
     void init()
     {
         db->clear();
@@ -198,7 +197,7 @@ private slots:
         QFile::remove(db->scratch(u"data/letterhead.txt"_s));
     }
 
-    void formatsValues()
+    void formatsValuesAndDates()
     {
         // "#,##0.00 Esc" is the layouts' one format: grouping, two decimals, halves to even, no "-0,00".
         const QVariantList values = {1234.5, 1234567.891, 0.0, 0.125, -1234.5, -0.001, u"12.5"_s, u"abc"_s, QVariant(QMetaType::fromType<double>())};
@@ -207,10 +206,7 @@ private slots:
             formatted << formatReportValue(value, u"#,##0.00 Esc"_s);
         QCOMPARE(formatted, (QStringList{"1.234,50 Esc", "1.234.567,89 Esc", "0,00 Esc", "0,12 Esc", "-1.234,50 Esc", "0,00 Esc", "12,50 Esc", "abc", ""}));
         QCOMPARE(formatReportValue(u"100234"_s, QString()), u"100234"_s);  // digits without a format stay as they are
-    }
-
-    void writesTheLongPortugueseDate()
-    {
+        // The date of printing, "%D".
         QCOMPARE(longPortugueseDate(QDate(2026, 12, 6)) + u", "_s + longPortugueseDate(QDate(2027, 3, 1)),
                  u"6 de dezembro de 2026, 1 de março de 2027"_s);
     }

@@ -1,0 +1,465 @@
+// The reports: the banded engine without a database (the fixed formats, the
+// date of printing, pagination), then the debt listing, the debt
+// letters and the rejects listing on both engines, read from the pages of the
+// previews that General shows (layout, who is listed and in what order, the
+// totals, the pages, the letters, the reports' connection), and written to
+// PDF by the quotas program.
+
+#include "component/general.h"
+#include "component/shared_objects.h"
+#include "import/rejects_listing.h"
+#include "platform/errors.h"
+#include "platform/recordset.h"
+#include "reports/entry.h"
+#include "reports/report.h"
+#include "reports/report_engine.h"
+#include "reports/report_format.h"
+#include "support/cli_process.h"
+#include "support/test_database.h"
+
+#include <QFile>
+#include <QPrintPreviewDialog>
+#include <QPrintPreviewWidget>
+#include <QProcess>
+#include <QRegularExpression>
+#include <QTest>
+#include <QTimer>
+
+using namespace quotas;
+using namespace quotas::test;
+using namespace Qt::StringLiterals;
+
+namespace {
+
+const QVariant null = QVariant(QMetaType::fromType<QString>());
+
+// The items of that layout name, in page order (on one page when page >= 0).
+std::vector<const PlacedItem*> placed(const ReportDocument& doc, const QString& name, int page = -1)
+{
+    std::vector<const PlacedItem*> found;
+    for (int p = 0; p < doc.pageCount(); ++p) {
+        for (const PlacedItem& item : doc.pages[p].items) {
+            if (item.item->name == name && (page < 0 || page == p))
+                found.push_back(&item);
+        }
+    }
+    return found;
+}
+
+// The texts of the items of those names side by side, "a|b|c", one line per
+// item of the first name (per detail, per letter).
+QStringList texts(const ReportDocument& doc, const QStringList& names)
+{
+    QStringList lines;
+    for (int n = 0; n < names.size(); ++n) {
+        const auto items = placed(doc, names[n]);
+        for (int i = 0; i < int(items.size()); ++i) {
+            if (n == 0)
+                lines << items[i]->text;
+            else if (i < lines.size())
+                lines[i] += u'|' + items[i]->text;
+        }
+    }
+    return lines;
+}
+
+QList<int> tops(const ReportDocument& doc, const QString& name)
+{
+    QList<int> found;
+    for (const PlacedItem* item : placed(doc, name))
+        found << item->rect.top();
+    return found;
+}
+
+QList<int> countsPerPage(const ReportDocument& doc, const QString& name)
+{
+    QList<int> counts;
+    for (int p = 0; p < doc.pageCount(); ++p)
+        counts << int(placed(doc, name, p).size());
+    return counts;
+}
+
+// The first item of that name as "text | left,top widthxheight | font | alignment",
+// placed from the report's left edge and from top.
+QString describe(const ReportDocument& doc, const QString& name, int top)
+{
+    const auto found = placed(doc, name);
+    if (found.empty())
+        return u"no item "_s + name;
+    const PlacedItem& p = *found.front();
+    const ReportFont& f = p.item->font;
+    const QRect r = p.rect.translated(-PaperSetup::leftMargin(*doc.layout), -top);
+    const char* aligns[] = {"left", "center", "right"};
+    return u"%1 | %2,%3 %4x%5 | %6 %7%8%9 | %10"_s.arg(p.text).arg(r.left()).arg(r.top()).arg(r.width()).arg(r.height())
+        .arg(f.family).arg(f.pointSize).arg(f.bold ? " bold" : "", f.italic ? " italic" : "", aligns[int(p.item->align)]);
+}
+
+// A layout of one detail and a report footer with a count, laid out over rows numbered 1 to count.
+ReportDocument layOut(int detail, int reportFooter, bool breakAfter, int count)
+{
+    auto layout = std::make_shared<ReportLayout>();
+    layout->detail = reportBand(u"D"_s, detail, {field(u"d"_s, u"no_tap"_s, 0, 0, 1000, 200)}, breakAfter);
+    layout->reportFooter = reportBand(u"RF"_s, reportFooter, {countOf(u"count"_s, u"no_tap"_s, 0, 0, 1000, 200)});
+    Recordset rs;
+    rs.openInMemory({u"no_tap"_s});
+    for (int i = 1; i <= count; ++i) {
+        rs.addNew();
+        rs.setValue(0, QString::number(i));
+        rs.update();
+    }
+    return layOutReport(layout, rs);
+}
+
+constexpr int kUsable = PaperSetup::kHeight - PaperSetup::kTopMargin - PaperSetup::kBottomMargin;
+
+struct Pages {
+    int rows, detail, reportFooter;
+    bool breakAfter;
+    QList<int> perPage;
+};
+
+struct Place {
+    const char *report, *name;
+    int bandTop;
+    QString expected;  // text | left,top in the band widthxheight | font | alignment
+};
+
+}  // namespace
+Q_DECLARE_METATYPE(Pages)
+Q_DECLARE_METATYPE(Place)
+
+class ReportsTest : public QObject {
+    Q_OBJECT
+
+    std::unique_ptr<TestDatabase> db;
+    QString registry;
+    std::vector<ReportDocument> shown;
+    QStringList titles;  // of the previews of the last showing
+
+    void addDebtor(int id, const QVariant& noTap, const QVariant& nome, double charged, double paid = 0,
+                   const QVariantList& address = {null, null, null}, Connection* on = nullptr)
+    {
+        Connection& c = on ? *on : db->connection();
+        c.execute(u"INSERT INTO tbSocios (socio_id, no_tap, nome, morada1, code_postal1, localidade1) VALUES (?, ?, ?, ?, ?, ?)"_s,
+                  QVariantList{id, noTap, nome} + address);
+        c.execute(u"INSERT INTO tbQuotas_Socios (socio_id, total_quotas, total_pago) VALUES (?, ?, ?)"_s, {id, charged, paid});
+    }
+    void reject(QVariantList fields)
+    {
+        while (fields.size() < 5)
+            fields << null;
+        db->connection().execute(u"INSERT INTO extras (Field0, Field1, Field2, Field3, Field4) VALUES (?, ?, ?, ?, ?)"_s, fields);
+    }
+    void letterhead(const QByteArray& text)
+    {
+        QFile head(db->scratch(u"data/letterhead.txt"_s));
+        QVERIFY(head.open(QIODevice::WriteOnly) && head.write(text) == text.size());
+    }
+
+    // Shows "listing", "letters" or "rejects" as the host does, closing the
+    // modal preview with Escape as a user would once it is up, and returns
+    // the pages it showed.
+    ReportDocument show(const QString& report)
+    {
+        shown.clear();
+        titles.clear();
+        QList<int> pageCounts;
+        QTimer closer;
+        QObject::connect(&closer, &QTimer::timeout, [&] {
+            if (auto* dialog = qobject_cast<QPrintPreviewDialog*>(QApplication::activeModalWidget()); dialog && dialog->isVisible()) {
+                titles << dialog->windowTitle();
+                pageCounts << dialog->findChild<QPrintPreviewWidget*>()->pageCount();
+                QTest::keyClick(dialog, Qt::Key_Escape);
+            }
+        });
+        closer.start(10);
+        General general;
+        report == "listing"_L1 ? general.ListagemDividas() : report == "letters"_L1 ? general.CartasDividas() : showRejectsListing();
+        if (shown.size() != 1 || pageCounts != QList<int>{shown.front().pageCount()})
+            qFatal("expected one preview of all the pages, got %d documents and %d dialogs", int(shown.size()), int(titles.size()));
+        return shown.front();
+    }
+
+private slots:
+    void initTestCase()
+    {
+        db = std::make_unique<TestDatabase>();
+        registry = db->useAsSettings();
+        Report::setObserver([this](const ReportDocument& doc) { shown.push_back(doc); });
+        qputenv("QUOTAS_DATA_DIR", db->scratch(u"data"_s).toUtf8());
+        QDir().mkpath(db->scratch(u"data"_s));
+    }
+    void init()
+    {
+        db->clear();
+        db->login();
+        shown.clear();
+        QFile::remove(db->scratch(u"data/letterhead.txt"_s));
+    }
+
+    void formatsValuesAndDates()
+    {
+        // "#,##0.00 Esc" is the layouts' one format: grouping, two decimals, halves to even, no "-0,00".
+        const QVariantList values = {1234.5, 1234567.891, 0.0, 0.125, -1234.5, -0.001, u"12.5"_s, u"abc"_s, QVariant(QMetaType::fromType<double>())};
+        QStringList formatted;
+        for (const QVariant& value : values)
+            formatted << formatReportValue(value, u"#,##0.00 Esc"_s);
+        QCOMPARE(formatted, (QStringList{"1.234,50 Esc", "1.234.567,89 Esc", "0,00 Esc", "0,12 Esc", "-1.234,50 Esc", "0,00 Esc", "12,50 Esc", "abc", ""}));
+        QCOMPARE(formatReportValue(u"100234"_s, QString()), u"100234"_s);  // digits without a format stay as they are
+        // The date of printing, "%D".
+        QCOMPARE(longPortugueseDate(QDate(2026, 12, 6)) + u", "_s + longPortugueseDate(QDate(2027, 3, 1)),
+                 u"6 de dezembro de 2026, 1 de março de 2027"_s);
+    }
+
+    void paginates_data()
+    {
+        QTest::addColumn<Pages>("p");
+        // Four details fill a page exactly: the fourth ends on the footer's edge and stays.
+        QTest::newRow("exact fit") << Pages{8, kUsable / 4, 0, false, {4, 4}};
+        QTest::newRow("one too many") << Pages{9, kUsable / 4, 0, false, {4, 4, 1}};
+        QTest::newRow("footer that no longer fits") << Pages{8, kUsable / 4, 1, false, {4, 4, 0}};
+        QTest::newRow("a hair too tall") << Pages{4, kUsable / 4 + 1, 0, false, {3, 1}};
+        QTest::newRow("no rows") << Pages{0, 500, 100, false, {0}};
+        QTest::newRow("break after each") << Pages{3, 1000, 0, true, {1, 1, 1}};
+        QTest::newRow("break, then the report footer") << Pages{3, 1000, 300, true, {1, 1, 1, 0}};
+    }
+    void paginates()
+    {
+        QFETCH(Pages, p);
+        const ReportDocument doc = layOut(p.detail, p.reportFooter, p.breakAfter, p.rows);
+        QCOMPARE(countsPerPage(doc, u"d"_s), p.perPage);
+        QStringList order;
+        for (int i = 1; i <= p.rows; ++i)
+            order << QString::number(i);
+        QCOMPARE(texts(doc, {u"d"_s}), order);
+        QCOMPARE(countsPerPage(doc, u"count"_s).last(), p.reportFooter ? 1 : 0);
+    }
+
+    void showsTextsInTheirFontsAndPlaces_data()
+    {
+        QTest::addColumn<Place>("place");
+        const int rh = PaperSetup::kTopMargin, ph = rh + 990, detail = ph + 428, rf = detail + 322;
+        const int pf = PaperSetup::kHeight - PaperSetup::kBottomMargin - 390;
+        const int xph = rh + 330, xdetail = xph + 428, xrf = xdetail + 337, xpf = pf - 45;  // the rejects listing's bands
+        const QString date = longPortugueseDate(QDate::currentDate());
+        for (const Place& p : std::initializer_list<Place>{
+                 {"listing", "lblTitulo", rh, u"Listagem de Quotas em Dívida por Associado | 90,135 10470x255 | Times New Roman 12 bold | center"_s},
+                 {"listing", "lblData", rh, date + u" | 5880,540 4665x240 | Arial 8.25 italic | right"_s},
+                 {"listing", "lblNoTap", ph, u"Nº TAP | 210,75 1425x240 | Arial 8.25 bold | left"_s},
+                 {"listing", "txtDivida", detail, u"1.234,56 Esc | 7800,45 2250x270 | Arial 8.25 | right"_s},
+                 {"listing", "lblProcessado", pf, u"Processado por Computador | 60,105 2130x225 | Arial 6.75 | left"_s},
+                 {"listing", "lblPaginaNo", pf, u"1 | 9090,105 585x240 | Arial 8.25 italic | right"_s},
+                 {"listing", "lblTotalRegistos", rf, u"Total de registos listados: | 5505,165 2310x195 | Arial 8.25 bold | left"_s},
+                 {"listing", "fnDividas", rf, u"1.234,56 Esc | 7860,555 1635x225 | Arial 8.25 | right"_s},
+                 {"letters", "txtNoTap", rh, u"101 | 4470,1935 1650x225 | Arial 8.25 | left"_s},
+                 {"letters", "lblData", rh, date + u" | 105,4755 5580x300 | Arial 9 italic | left"_s},
+                 {"letters", "lblRegularizacao", rh, u"Regularização de Débitos | 1065,5235 4065x300 | Arial 11.25 bold | left"_s},
+                 {"rejects", "Label8", rh, u"Listagem de Dados não Importados para a Base de Dados | 75,30 10470x255 | Times New Roman 12 bold | center"_s},
+                 {"rejects", "Label1", xph, u"Campo 1 | 75,75 1005x240 | Arial 8.25 bold | left"_s},
+                 {"rejects", "Text2", xdetail, u"100234 | 60,45 1020x270 | Arial 8.25 | left"_s},
+                 {"rejects", "Label18", xpf, u"Página: | 8490,105 570x255 | Arial 8.25 italic | left"_s},
+                 {"rejects", "Function1", xrf, u"1 | 9765,75 705x225 | Arial 8.25 | right"_s}})
+            QTest::addRow("%s %s", p.report, p.name) << p;
+    }
+    void showsTextsInTheirFontsAndPlaces()
+    {
+        QFETCH(Place, place);
+        addDebtor(1, u"101"_s, u"Ana Silva"_s, 1334.56, 100);
+        reject({u"100234"_s, u"b"_s, u"c"_s, u"d"_s});
+        QCOMPARE(describe(show(QString::fromLatin1(place.report)), QString::fromLatin1(place.name), place.bandTop), place.expected);
+    }
+
+    void listsDebtsAboveOneEuroInOrderOfNameCountingStaffNumbers()
+    {
+        const struct {
+            int id;
+            const char* name;
+            double charged, paid;
+        } accounts[] = {{1, "Rui", 50, 0}, {2, "Nuno", 1.00, 0}, {3, "Ivo", 2.2, 1.2},  // 2.20 - 1.20 is a hair above 1 in REAL
+                        {4, "Maria", 1.01, 0}, {5, "Carla", 0.7 + 0.41, 0.1}, {6, "Bruno", 10, 30}, {7, "Eva", 12345.67, 0.67},
+                        {9, "Ana", 5, 0}, {8, "Ana", 5, 0}};  // equal names keep the accounts' order
+        for (const auto& a : accounts)
+            addDebtor(a.id, QString::number(100 + a.id), QString::fromUtf8(a.name), a.charged, a.paid);
+        addDebtor(10, null, u"Paulo"_s, 20);  // in the total, not in the number of records
+        addDebtor(11, u""_s, u"Sara"_s, 30);  // an empty number counts
+        db->connection().execute(u"INSERT INTO tbQuotas_Socios (socio_id, total_quotas, total_pago) VALUES (99, 40.5, 0)"_s);
+        const ReportDocument doc = show(u"listing"_s);
+        QStringList rows = texts(doc, {u"txtNoTap"_s, u"txtNome"_s, u"txtDivida"_s});
+        QVERIFY(rows.removeOne(u"||40,50 Esc"_s));  // no member row; where a Null name sorts depends on the engine
+        QCOMPARE(rows, (QStringList{"109|Ana|5,00 Esc", "108|Ana|5,00 Esc", "105|Carla|1,01 Esc", "107|Eva|12.345,00 Esc",
+                                    "104|Maria|1,01 Esc", "|Paulo|20,00 Esc", "101|Rui|50,00 Esc", "|Sara|30,00 Esc"}));
+        QCOMPARE(texts(doc, {u"fnRegistos"_s, u"fnDividas"_s}), QStringList{"7|12.497,52 Esc"});
+        QCOMPARE(texts(show(u"letters"_s), {u"txtNoTap"_s}), texts(doc, {u"txtNoTap"_s}));  // the same members in the same order
+    }
+
+    void numbersAndCountsPagesOverSeveralPages()
+    {
+        for (int i = 1; i <= 100; ++i)
+            addDebtor(i, QString::number(i), u"Associado %1"_s.arg(i, 3, 10, QLatin1Char('0')), 2 + i);
+        const ReportDocument doc = show(u"listing"_s);
+        // 43 rows under the title on page 1, 46 on page 2, 11 and the totals on page 3; the column heads on each.
+        QCOMPARE(countsPerPage(doc, u"txtNome"_s) + countsPerPage(doc, u"lblNoTap"_s) + countsPerPage(doc, u"fnRegistos"_s),
+                 (QList<int>{43, 46, 11, 1, 1, 1, 0, 0, 1}));
+        QCOMPARE(texts(doc, {u"lblPaginaNo"_s, u"lblPaginas"_s}) + texts(doc, {u"fnDividas"_s}),
+                 (QStringList{"1|3", "2|3", "3|3", "5.250,00 Esc"}));  // 100 x 2 + (1 + ... + 100)
+        // The page header under the report header, then at the top; the page footer at the foot of each page; the
+        // report footer right after the last detail.
+        const int foot = PaperSetup::kHeight - PaperSetup::kBottomMargin - 390 + 105, lastDetail = 567 + 428 + 11 * 322;
+        QCOMPARE(tops(doc, u"lblNoTap"_s) + tops(doc, u"lblPaginaNo"_s) + tops(doc, u"fnDividas"_s),
+                 (QList<int>{567 + 990 + 75, 567 + 75, 567 + 75, foot, foot, foot, lastDetail + 555}));
+    }
+
+    void writesOneLetterPerPageWithTheMembersAddress()
+    {
+        letterhead("# timbre\nnome = Sindicato de Teste\nmorada = Rua do Teste, 1, 1000-001 Lisboa\n");
+        addDebtor(1, u"101"_s, u"Ana Silva"_s, 1334.56, 100, {u"Rua Augusta, 10"_s, u"1100-053"_s, u"Lisboa"_s});
+        addDebtor(2, u"102"_s, u"Bruno Costa"_s, 20, 0, {u"Rua do Ouro, 5"_s, null, u"Porto"_s});
+        addDebtor(3, u"103"_s, u"Carla Dias"_s, 30, 0, {null, u"8000-164"_s, null});
+        const ReportDocument doc = show(u"letters"_s);
+        QCOMPARE(countsPerPage(doc, u"txtNome"_s), (QList<int>{1, 1, 1}));
+        QCOMPARE(texts(doc, {u"lblSindicato"_s, u"lblMoradaSindicato"_s}), QStringList(3, u"Sindicato de Teste|Rua do Teste, 1, 1000-001 Lisboa"_s));
+        // A Null postcode or town empties the whole line; a Null address its own.
+        QCOMPARE(texts(doc, {u"lblNoEmpresa"_s, u"txtNoTap"_s, u"lblAssociado"_s, u"txtNome"_s, u"lblMorada"_s, u"txtMorada"_s,
+                             u"lblLocalidade"_s, u"txtCodigoPostal"_s, u"lblTexto2"_s, u"txtDivida"_s}),
+                 (QStringList{"Nº Empresa:|101|Associado:|Ana Silva|Morada:|Rua Augusta, 10|Localidade:|1100-053 Lisboa| na presente data, de ESC:|1.234,56 Esc",
+                              "Nº Empresa:|102|Associado:|Bruno Costa|Morada:|Rua do Ouro, 5|Localidade:|| na presente data, de ESC:|20,00 Esc",
+                              "Nº Empresa:|103|Associado:|Carla Dias|Morada:||Localidade:|| na presente data, de ESC:|30,00 Esc"}));
+    }
+
+    void lettersFallBackToTheDefaultLetterheadButNotPastAnUnreadableOne()
+    {
+        addDebtor(1, u"101"_s, u"Ana"_s, 5);
+        QCOMPARE(texts(show(u"letters"_s), {u"lblSindicato"_s, u"lblMoradaSindicato"_s}), QStringList{"Orbela|"});
+        QVERIFY(QDir().mkpath(db->scratch(u"data/letterhead.txt"_s)));  // there, but not readable as a file
+        QVERIFY_THROWS_EXCEPTION(QuotasError, General().CartasDividas());
+        QDir(db->scratch(u"data/letterhead.txt"_s)).removeRecursively();
+    }
+
+    void showsAPaymentMadeBetweenTwoShowings()
+    {
+        QCOMPARE(texts(show(u"listing"_s), {u"fnRegistos"_s, u"fnDividas"_s, u"lblPaginaNo"_s, u"lblPaginas"_s}), QStringList{"0|0,00 Esc|1|1"});
+        addDebtor(1, u"101"_s, u"Ana"_s, 100);
+        addDebtor(2, u"102"_s, u"Bruno"_s, 30);
+        for (const QString report : {"listing", "letters"}) {
+            QCOMPARE(texts(show(report), {u"txtDivida"_s}), (QStringList{"100,00 Esc", "30,00 Esc"}));
+            QVERIFY(!Data().Dividas.recordset().isOpen());
+        }
+        const auto elsewhere = db->openAnother();
+        elsewhere->execute(u"UPDATE tbQuotas_Socios SET total_pago = total_pago + 40 WHERE socio_id = 1"_s);
+        elsewhere->execute(u"UPDATE tbQuotas_Socios SET total_pago = 30 WHERE socio_id = 2"_s);
+        const ReportDocument after = show(u"listing"_s);
+        QCOMPARE(texts(after, {u"txtDivida"_s}) + texts(after, {u"fnDividas"_s}), (QStringList{"60,00 Esc", "60,00 Esc"}));
+        QCOMPARE(texts(show(u"letters"_s), {u"txtDivida"_s}), QStringList{"60,00 Esc"});
+    }
+
+    void preparesTheReportsConnection_data()
+    {
+        QTest::addColumn<bool>("aligned");
+        QTest::addColumn<bool>("open");
+        QTest::newRow("aligned and open: used as it stands") << true << true;
+        QTest::newRow("aligned and closed: opened") << true << false;
+        QTest::newRow("elsewhere and open: closed, aligned, reopened") << false << true;
+        QTest::newRow("elsewhere and closed: aligned, opened") << false << false;
+    }
+    void preparesTheReportsConnection()
+    {
+        QFETCH(bool, aligned);
+        QFETCH(bool, open);
+        addDebtor(1, u"1"_s, u"Principal"_s, 10);
+        TestDatabase other;
+        addDebtor(1, u"1"_s, u"Outra"_s, 10, 0, {null, null, null}, &other.connection());
+        Connection& prints = Data().SqlServer_Prints;
+        prints.close();
+        prints.setConnectionString(aligned ? Data().SqlServer.connectionString() : other.connectionString());
+        prints.open();
+        prints.execute(u"CREATE TEMPORARY TABLE marca (x INTEGER)"_s);  // marks the session
+        if (open)
+            Data().Dividas.execute();  // rows read there are never shown as those of the database it moves to
+        else
+            prints.close();
+        QCOMPARE(texts(show(u"listing"_s), {u"txtNome"_s}), QStringList{"Principal"});
+        QCOMPARE(prints.connectionString(), Data().SqlServer.connectionString());
+        if (aligned && open)
+            prints.scalar(u"SELECT COUNT(*) FROM marca"_s);
+        else
+            QVERIFY_THROWS_EXCEPTION(DbError, prints.scalar(u"SELECT COUNT(*) FROM marca"_s));
+    }
+
+    // A showing that fails once the debts are read still lets them go, so the
+    // next showing does not present them again.
+    void aFailedShowingStillClosesTheDebts()
+    {
+        addDebtor(1, u"101"_s, u"Ana"_s, 10);
+        QVERIFY_THROWS_EXCEPTION(QuotasError, writeDebtListingPdf(db->scratch(u"missing/out.pdf"_s)));
+        QCOMPARE(int(shown.size()), 1);
+        QVERIFY(!Data().Dividas.recordset().isOpen());
+    }
+
+    // Table extras as it stands: every line in the database's order, the
+    // first four columns, an empty first column counted and a Null one not.
+    void listsTheRejectsAfreshAtEveryShowing()
+    {
+        reject({null, u"sem número"_s});
+        reject({u""_s, u"vazio"_s});
+        reject({u"300"_s, u"Rui"_s, u"12,50"_s});
+        reject({u"100"_s, u"Ana"_s, u"c"_s, u"d"_s, u"quinta coluna"_s});
+        const ReportDocument doc = show(u"rejects"_s);
+        QCOMPARE(titles, QStringList{"Listagem de Dados não Importados para a Base de Dados"});
+        QCOMPARE(texts(doc, {u"Text2"_s, u"Text1"_s, u"Text3"_s, u"Text7"_s}) + texts(doc, {u"Function1"_s}),
+                 (QStringList{"|sem número||", "|vazio||", "300|Rui|12,50|", "100|Ana|c|d", "3"}));
+        QVERIFY(!Data().Extras.recordset().isOpen());
+        reject({u"200"_s, u"Eva"_s});
+        QCOMPARE(texts(show(u"rejects"_s), {u"Text2"_s}).last(), u"200"_s);
+    }
+
+    // The quotas program writes the same pages to PDF: read back with
+    // poppler's pdftotext (spaces squeezed) and pdffonts.
+    void theCommandsWriteThePagesToPdf_data()
+    {
+        QTest::addColumn<QString>("command");
+        QTest::addColumn<QStringList>("pages");  // lines that each page holds
+        QTest::newRow("listagem") << "listagem" << QStringList{"Listagem de Quotas em Dívida por Associado\nNº TAP Nome Dívida\n100300 Ana "
+                                                               "Conceição 12,50 Esc\n100200 Joaquim Gonçalves 1.300,25 Esc\nTotal de registos "
+                                                               "listados: 2\nTotal de Dívidas: 1.312,75 Esc\nProcessado por Computador Página: 1 / 1"};
+        const QString letter = u"Sindicato de Ensaio\nRua Direita, 7, 3000-001 Coimbra\nAssociado: %1\nLocalidade: %2\n"
+                               "Assunto: Regularização de Débitos\nna presente data, de ESC: %3\nA Direcção"_s;
+        QTest::newRow("cartas") << "cartas" << QStringList{letter.arg("Ana Conceição", "4000-322 Porto", "12,50 Esc"),
+                                                           letter.arg("Joaquim Gonçalves", "1100-053 Lisboa", "1.300,25 Esc")};
+        QTest::newRow("rejeitados") << "rejeitados" << QStringList{"Listagem de Dados não Importados para a Base de Dados\n"
+                                                                   "Campo 1 Campo 2 Campo 3 Campo 4\n999001 Linha Rejeitada 12,50 TAP"};
+    }
+    void theCommandsWriteThePagesToPdf()
+    {
+        QFETCH(QString, command);
+        QFETCH(QStringList, pages);
+        letterhead("nome = Sindicato de Ensaio\nmorada = Rua Direita, 7, 3000-001 Coimbra\n");
+        addDebtor(1, u"100200"_s, u"Joaquim Gonçalves"_s, 1500.25, 200, {u"Rua Augusta, 10"_s, u"1100-053"_s, u"Lisboa"_s});
+        addDebtor(2, u"100300"_s, u"Ana Conceição"_s, 12.5, 0, {u"Rua do Ouro, 5"_s, u"4000-322"_s, u"Porto"_s});
+        reject({u"999001"_s, u"Linha Rejeitada"_s, u"12,50"_s, u"TAP"_s});
+        const QString pdf = db->scratch(command + u".pdf"_s);
+        const CliRun r = runQuotas(registry, {command, u"--pdf"_s, pdf});
+        QVERIFY2(r.status == 0, qPrintable(r.err));
+        QProcess text, fonts;
+        text.start(u"pdftotext"_s, {u"-layout"_s, pdf, u"-"_s});
+        fonts.start(u"pdffonts"_s, {pdf});
+        QVERIFY(text.waitForFinished() && fonts.waitForFinished());
+        QStringList printed = QString::fromUtf8(text.readAllStandardOutput()).replace(QRegularExpression(u"[ \\t]+"_s), u" "_s)
+                                  .replace(QRegularExpression(u" ?/ ?"_s), u" / "_s).split(u'\f');
+        printed.removeIf([](const QString& page) { return page.trimmed().isEmpty(); });
+        QCOMPARE(printed.size(), pages.size());
+        for (int i = 0; i < pages.size(); ++i) {
+            for (const QString& line : pages[i].split(u'\n'))
+                QVERIFY2(printed[i].contains(line), qPrintable(line + u"\n--- not on this page:\n"_s + printed[i]));
+        }
+        // Arial and Times New Roman are printed in their metric twins.
+        const QString used = QString::fromUtf8(fonts.readAllStandardOutput());
+        QVERIFY2(used.contains(u"LiberationSans"_s) && (command == "cartas"_L1 || used.contains(u"LiberationSerif-Bold"_s)), qPrintable(used));
+        // A usage problem exits with 2, a file that cannot be written with 1, each with a message.
+        const CliRun noPdf = runQuotas(registry, {command}), unwritable = runQuotas(registry, {command, u"--pdf"_s, u"/nonexistent/out.pdf"_s});
+        QCOMPARE((QList<int>{noPdf.status, unwritable.status}), (QList<int>{2, 1}));
+        QVERIFY(!noPdf.err.isEmpty() && !unwritable.err.isEmpty());
+    }
+};
+
+QTEST_MAIN(ReportsTest)
+#include "tst_reports.moc"

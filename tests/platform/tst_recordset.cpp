@@ -51,39 +51,41 @@ private slots:
         QVERIFY_THROWS_EXCEPTION(DbError, rs.value(0));
     }
 
-    void findReturnsTheFirstMatchAtOrAfterTheCurrentRow()
+    void findGivesTheFirstMatchAtOrAfterTheCurrentRow_data()
     {
+        QTest::addColumn<int>("from");
+        QTest::addColumn<QString>("key");
+        QTest::addColumn<int>("found");
+        QTest::newRow("first of two") << 0 << "7" << 0;
+        QTest::newRow("from the row after it") << 1 << "7" << 2;
+        QTest::newRow("past the last") << 3 << "7" << -1;
+        QTest::newRow("a quote is just a character") << 0 << "x'y" << 3;
+        QTest::newRow("no injection") << 0 << "x' OR '1'='1" << -1;
+        QTest::newRow("text is exact") << 0 << "07" << 5;
+        QTest::newRow("edited into the key") << 0 << "new" << 1;
+    }
+    void findGivesTheFirstMatchAtOrAfterTheCurrentRow()
+    {
+        QFETCH(int, from);
+        QFETCH(QString, key);
+        QFETCH(int, found);
         Recordset rs;
-        rs.openInMemory({QStringLiteral("no_tap"), QStringLiteral("n")});
-        const QStringList keys = {"7", "3", "7", "x'y", "3", "07"};
-        for (int i = 0; i < keys.size(); ++i) {
+        rs.openInMemory({QStringLiteral("no_tap")});
+        for (const char* k : {"7", "3", "7", "x'y", "3", "07"}) {
             rs.addNew();
-            rs.setValue(0, keys[i]);
-            rs.setValue(1, QString::number(i));
+            rs.setValue(0, QString::fromLatin1(k));
             rs.update();
         }
         rs.moveFirst();
-        QVERIFY(rs.find(QStringLiteral("no_tap"), QStringLiteral("7")));
-        QCOMPARE(rs.value(1).toString(), QStringLiteral("0"));
-        rs.moveNext();
-        QVERIFY(rs.find(QStringLiteral("no_tap"), QStringLiteral("7")));
-        QCOMPARE(rs.value(1).toString(), QStringLiteral("2"));
-        rs.moveFirst();
-        QVERIFY(rs.find(QStringLiteral("no_tap"), QStringLiteral("x'y")));
-        QCOMPARE(rs.value(1).toString(), QStringLiteral("3"));
-        rs.moveFirst();
-        QVERIFY(!rs.find(QStringLiteral("no_tap"), QStringLiteral("x' OR '1'='1")));
-        QVERIFY(rs.eof());
-        // The index follows changes: a row edited to a key is found under it.
-        rs.moveFirst();
+        rs.find(QStringLiteral("no_tap"), QStringLiteral("3"));  // builds the index before the edit
         rs.setValue(0, QStringLiteral("new"));
         rs.update();
         rs.moveFirst();
-        QVERIFY(rs.find(QStringLiteral("no_tap"), QStringLiteral("new")));
-        QCOMPARE(rs.value(1).toString(), QStringLiteral("0"));
-        rs.moveFirst();
-        QVERIFY(rs.find(QStringLiteral("no_tap"), QStringLiteral("7")));
-        QCOMPARE(rs.value(1).toString(), QStringLiteral("2"));
+        for (int i = 0; i < from; ++i)
+            rs.moveNext();
+        QCOMPARE(rs.find(QStringLiteral("no_tap"), key), found >= 0);
+        QCOMPARE(rs.position(), found);
+        QCOMPARE(rs.eof(), found < 0);
     }
 
     void findComparesNumbersByValueAndNeverMatchesNull()
@@ -93,15 +95,15 @@ private slots:
                         {id, id == 9 ? QVariant(QMetaType::fromType<double>()) : QVariant(10.5)});
         Recordset rs;
         rs.open(QStringLiteral("SELECT * FROM tbQuotas_Socios ORDER BY socio_id"), c(), Cursor::Static, Lock::Optimistic);
-        QVERIFY(rs.find(QStringLiteral("socio_id"), 9.0));
-        QCOMPARE(rs.value(QStringLiteral("socio_id")).toInt(), 9);
-        rs.moveFirst();
-        QVERIFY(rs.find(QStringLiteral("socio_id"), QStringLiteral("12")));
-        rs.moveFirst();
-        QVERIFY(!rs.find(QStringLiteral("total_quotas"), QVariant(QMetaType::fromType<double>())));
-        rs.moveFirst();
-        QVERIFY(rs.find(QStringLiteral("total_quotas"), 10.5));
-        QCOMPARE(rs.value(QStringLiteral("socio_id")).toInt(), 5);
+        const auto position = [&](const char* column, const QVariant& v) {
+            rs.moveFirst();
+            rs.find(QString::fromLatin1(column), v);
+            return rs.position();
+        };
+        QCOMPARE(position("socio_id", 9.0), 1);
+        QCOMPARE(position("socio_id", QStringLiteral("12")), 2);
+        QCOMPARE(position("total_quotas", QVariant(QMetaType::fromType<double>())), -1);
+        QCOMPARE(position("total_quotas", 10.5), 0);
     }
 
     void savesChangedColumnsOfTheBaseTableByKey()

@@ -3,7 +3,6 @@
 
 #include "component/general.h"
 #include "component/shared_objects.h"
-#include "platform/connection_string.h"
 #include "platform/errors.h"
 #include "settings/login.h"
 #include "settings/password.h"
@@ -108,24 +107,6 @@ private slots:
         QVERIFY(General().Login());
         QVERIFY(Data().SqlServer.connectionString().startsWith(
             QStringLiteral("Provider=MSDataShape.1;Persist Security Info=;Connect Timeout=15;")));
-    }
-
-    void valuesCannotAddConnectionProperties()
-    {
-        const QString sneaky = QStringLiteral("x;Data Source=/tmp/elsewhere.db;Initial Catalog='y\"");
-        if (test::engineUnderTest() == Engine::SQLite) {
-            writeSettings({}, sneaky, sneaky);
-            QVERIFY(General().Login());
-        } else {
-            LoginSettings s{QStringLiteral("False"), sneaky, sneaky, db->catalog(), db->dataSource()};
-            Data().SqlServer.setConnectionString(connectionString(s));
-        }
-        const auto props = parseConnectionString(Data().SqlServer.connectionString());
-        QCOMPARE(props.value(QStringLiteral("user id")), sneaky);
-        QCOMPARE(props.value(QStringLiteral("password")), sneaky);
-        QCOMPARE(props.value(QStringLiteral("data source")), db->dataSource());
-        QCOMPARE(props.value(QStringLiteral("initial catalog")), db->catalog());
-        QCOMPARE(props.size(), 8);
     }
 
     void anUnreachableDatabaseIsTheMethodsError()

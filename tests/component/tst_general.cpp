@@ -51,16 +51,6 @@ private slots:
         QVERIFY(!shared().frmQuota);
     }
 
-    void sharedObjectsExistOncePerThread()
-    {
-        DataEnvironment* data = &Data();
-        General a;
-        General b;
-        QCOMPARE(&Data(), data);
-        QCOMPARE(Data().Dividas.connection().name(), QStringLiteral("SqlServer_Prints"));
-        QCOMPARE(Data().Meses.connection().name(), QStringLiteral("SqlServer"));
-    }
-
     void releasingAGeneralReleasesTheProgressDisplay()
     {
         {

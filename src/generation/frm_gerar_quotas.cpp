@@ -1,5 +1,6 @@
 #include "generation/frm_gerar_quotas.h"
 #include "platform/dialog_layout.h"
+#include "component/month_names.h"
 
 #include "component/shared_objects.h"
 #include "generation/member_lookup.h"
@@ -20,16 +21,6 @@ namespace quotas {
 namespace {
 
 const QString kCaption = QStringLiteral("Gerar Quotas");
-
-// The long month names in the language of the union's staff.
-const QStringList& monthNames()
-{
-    static const QStringList names = {
-        QStringLiteral("Janeiro"), QStringLiteral("Fevereiro"), QStringLiteral("Março"),    QStringLiteral("Abril"),
-        QStringLiteral("Maio"),    QStringLiteral("Junho"),     QStringLiteral("Julho"),    QStringLiteral("Agosto"),
-        QStringLiteral("Setembro"), QStringLiteral("Outubro"),  QStringLiteral("Novembro"), QStringLiteral("Dezembro")};
-    return names;
-}
 
 template <typename W>
 W* placed(W* widget, const char* name, QRect geometry)

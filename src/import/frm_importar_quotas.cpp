@@ -1,5 +1,6 @@
 #include "import/frm_importar_quotas.h"
 #include "platform/dialog_layout.h"
+#include "component/month_names.h"
 
 #include "component/shared_objects.h"
 #include "import/processar_importacao.h"
@@ -32,15 +33,6 @@ W* place(W* widget, const QString& name, const QRect& geometry)
 }
 
 }  // namespace
-
-const QStringList& FrmImportarQuotas::monthNames()
-{
-    static const QStringList names = {QStringLiteral("Janeiro"), QStringLiteral("Fevereiro"), QStringLiteral("Março"),
-                                      QStringLiteral("Abril"),   QStringLiteral("Maio"),      QStringLiteral("Junho"),
-                                      QStringLiteral("Julho"),   QStringLiteral("Agosto"),    QStringLiteral("Setembro"),
-                                      QStringLiteral("Outubro"), QStringLiteral("Novembro"),  QStringLiteral("Dezembro")};
-    return names;
-}
 
 int FrmImportarQuotas::monthFromName(const QString& name)
 {

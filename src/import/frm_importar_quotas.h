@@ -19,8 +19,6 @@ class FrmImportarQuotas : public QDialog {
 public:
     explicit FrmImportarQuotas(QWidget* owner = nullptr);
 
-    // The twelve names the month list shows and Executar compares with.
-    static const QStringList& monthNames();
     // 1 to 12 for a name equal to one of them (case included), else 0.
     static int monthFromName(const QString& name);
 

@@ -1,5 +1,6 @@
 #include "schema/schema.h"
 
+#include "component/month_names.h"
 #include "platform/connection.h"
 #include "platform/transaction.h"
 
@@ -68,10 +69,8 @@ std::vector<TableDef> tables()
         extras.push_back({name, Kind::LongText});
 
     QStringList months;
-    const char* const names[] = {"Janeiro", "Fevereiro", "Março",    "Abril",   "Maio",      "Junho",
-                                 "Julho",   "Agosto",    "Setembro", "Outubro", "Novembro", "Dezembro"};
     for (int m = 1; m <= 12; ++m)
-        months << QStringLiteral("'%1', '%2'").arg(m, 2, 10, QLatin1Char('0')).arg(QString::fromUtf8(names[m - 1]));
+        months << QStringLiteral("'%1', '%2'").arg(m, 2, 10, QLatin1Char('0')).arg(monthNames()[m - 1]);
 
     return {
         {QStringLiteral("tbSocios"),

@@ -31,6 +31,23 @@ private:
     Recordset m_recordset;
 };
 
+// Closes a command's result set when it goes out of scope, however a showing
+// ends (after a failure too), so that the next showing reads the database again.
+class ClosesResultSet {
+public:
+    explicit ClosesResultSet(Command& command) : m_command(command) {}
+    ~ClosesResultSet()
+    {
+        if (m_command.recordset().isOpen())
+            m_command.recordset().close();
+    }
+    ClosesResultSet(const ClosesResultSet&) = delete;
+    ClosesResultSet& operator=(const ClosesResultSet&) = delete;
+
+private:
+    Command& m_command;
+};
+
 // The data environment "Data": the two connections and the named commands.
 class DataEnvironment {
 public:

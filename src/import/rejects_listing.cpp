@@ -10,37 +10,20 @@ namespace {
 
 Report& rejectsListing()
 {
-    QPointer<QObject>& held = shared().prtExtra;
-    if (!held)
-        held = new Report(rejectsListingLayout());
-    return *qobject_cast<Report*>(held.data());
+    return heldReport(shared().prtExtra, rejectsListingLayout);
 }
-
-// However the showing ends, the next one reads extras afresh.
-class ClosesExtras {
-public:
-    ClosesExtras() = default;
-    ~ClosesExtras()
-    {
-        Recordset& rs = Data().Extras.recordset();
-        if (rs.isOpen())
-            rs.close();
-    }
-    ClosesExtras(const ClosesExtras&) = delete;
-    ClosesExtras& operator=(const ClosesExtras&) = delete;
-};
 
 }  // namespace
 
 void showRejectsListing()
 {
-    ClosesExtras closing;
+    ClosesResultSet closing(Data().Extras);
     rejectsListing().showPreview();
 }
 
 void writeRejectsListingPdf(const QString& path)
 {
-    ClosesExtras closing;
+    ClosesResultSet closing(Data().Extras);
     rejectsListing().writePdf(path);
 }
 

@@ -12,46 +12,26 @@ namespace {
 
 Report& debtListing()
 {
-    QPointer<QObject>& held = shared().prtListagemDividas;
-    if (!held)
-        held = new Report(debtListingLayout());
-    return *qobject_cast<Report*>(held.data());
+    return heldReport(shared().prtListagemDividas, debtListingLayout);
 }
 
 Report& debtLetters()
 {
-    QPointer<QObject>& held = shared().prtCartasDividas;
-    if (!held)
-        held = new Report(debtLettersLayout(readLetterhead()));
-    else
-        // The letterhead file may have been edited since the last letters.
-        qobject_cast<Report*>(held.data())->setLayout(debtLettersLayout(readLetterhead()));
-    return *qobject_cast<Report*>(held.data());
+    const auto layout = [] { return debtLettersLayout(readLetterhead()); };
+    const bool existed = !shared().prtCartasDividas.isNull();
+    Report& letters = heldReport(shared().prtCartasDividas, layout);
+    // The letterhead file may have been edited since the last letters.
+    if (existed)
+        letters.setLayout(layout());
+    return letters;
 }
-
-// Closes rsDividas however the showing ends: after a failure too, so that a
-// later showing never presents the rows of an earlier one.
-class ClosesDividas {
-public:
-    explicit ClosesDividas(DataEnvironment& data) : m_data(data) {}
-    ~ClosesDividas()
-    {
-        if (m_data.Dividas.recordset().isOpen())
-            m_data.Dividas.recordset().close();
-    }
-    ClosesDividas(const ClosesDividas&) = delete;
-    ClosesDividas& operator=(const ClosesDividas&) = delete;
-
-private:
-    DataEnvironment& m_data;
-};
 
 template <typename Show>
 auto withReportsConnection(Show&& show)
 {
     DataEnvironment& data = Data();
     prepareReportsConnection(data);
-    ClosesDividas closing(data);
+    ClosesResultSet closing(data.Dividas);
     return show();
 }
 

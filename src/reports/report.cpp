@@ -84,4 +84,11 @@ int Report::writePdf(const QString& path)
     return doc.pageCount();
 }
 
+Report& heldReport(QPointer<QObject>& slot, const std::function<ReportLayout()>& layout)
+{
+    if (!slot)
+        slot = new Report(layout());
+    return *qobject_cast<Report*>(slot.data());
+}
+
 }  // namespace quotas

@@ -5,6 +5,7 @@
 
 #include <QDate>
 #include <QObject>
+#include <QPointer>
 #include <functional>
 #include <memory>
 
@@ -41,5 +42,9 @@ public:
 private:
     std::shared_ptr<const ReportLayout> m_layout;
 };
+
+// The report held in one of the shared slots (prtListagemDividas ...), created
+// with its layout on first use.
+Report& heldReport(QPointer<QObject>& slot, const std::function<ReportLayout()>& layout);
 
 }  // namespace quotas

@@ -26,7 +26,7 @@ int importar(const QStringList& args)
     const int tipo = options.number(QStringLiteral("tipo"), 1, 2);
     const QString file = options.positional().front();
     const QString pdf = options.isSet(QStringLiteral("pdf")) ? QFileInfo(options.value(QStringLiteral("pdf"))).absoluteFilePath()
-                                                              : QString();
+                                                             : QString();
     connectOrFail();
 
     shared().SemSeparadorDecimal = options.isSet(QStringLiteral("sem-separador"));

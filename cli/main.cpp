@@ -49,10 +49,14 @@ int dispatch(QStringList args)
         return args.isEmpty() ? 2 : 0;
     }
     static const std::map<QString, std::function<int(const QStringList&)>> commands = {
-        {QStringLiteral("config"), config},         {QStringLiteral("init-db"), initDb},
-        {QStringLiteral("login"), login},           {QStringLiteral("gerar"), gerar},
-        {QStringLiteral("importar"), importar},     {QStringLiteral("manutencao"), manutencao},
-        {QStringLiteral("listagem"), listagem},     {QStringLiteral("cartas"), cartas},
+        {QStringLiteral("config"), config},
+        {QStringLiteral("init-db"), initDb},
+        {QStringLiteral("login"), login},
+        {QStringLiteral("gerar"), gerar},
+        {QStringLiteral("importar"), importar},
+        {QStringLiteral("manutencao"), manutencao},
+        {QStringLiteral("listagem"), listagem},
+        {QStringLiteral("cartas"), cartas},
         {QStringLiteral("rejeitados"), rejeitados},
     };
     const auto command = commands.find(args.front());

@@ -91,8 +91,7 @@ QString movementsOf(const QVariant& socio)
 MainWindow::MainWindow(quotas::General& general, QWidget* parent)
     : QMainWindow(parent),
       m_general(general),
-      m_members(table(this, {QStringLiteral("Nº Empresa"), QStringLiteral("Nome"), QStringLiteral("Total Quotas"),
-                             QStringLiteral("Total Pago"), QStringLiteral("Em Dívida")},
+      m_members(table(this, {QStringLiteral("Nº Empresa"), QStringLiteral("Nome"), QStringLiteral("Total Quotas"), QStringLiteral("Total Pago"), QStringLiteral("Em Dívida")},
                       1)),
       m_movements(table(this,
                         {QStringLiteral("Data"), QStringLiteral("Ano"), QStringLiteral("Mês"), QStringLiteral("Número"),

@@ -16,11 +16,16 @@ struct Clip {
     int width = 0;
     int height = 0;
     int microsecondsPerFrame = 66667;
-    std::vector<std::uint32_t> palette;              // 0xRRGGBB, at most 256
-    std::vector<std::vector<std::uint8_t>> frames;   // palette indices, top row first
+    std::vector<std::uint32_t> palette;             // 0xRRGGBB, at most 256
+    std::vector<std::vector<std::uint8_t>> frames;  // palette indices, top row first
 };
 
-enum class Encoding { Raw8, Raw24, Rle8, Rle8Delta };
+enum class Encoding {
+    Raw8,
+    Raw24,
+    Rle8,
+    Rle8Delta
+};
 
 namespace detail {
 
@@ -180,12 +185,12 @@ inline std::vector<std::uint8_t> writeAvi(const Clip& clip, Encoding encoding)
     const std::size_t hdrl = open(out, "LIST", "hdrl");
     const std::size_t avih = open(out, "avih");
     put32(out, std::uint32_t(clip.microsecondsPerFrame));
-    put32(out, 0);             // max bytes per second
-    put32(out, 0);             // padding granularity
-    put32(out, 0x10);          // has an index
+    put32(out, 0);     // max bytes per second
+    put32(out, 0);     // padding granularity
+    put32(out, 0x10);  // has an index
     put32(out, frames);
-    put32(out, 0);             // initial frames
-    put32(out, 1);             // streams
+    put32(out, 0);  // initial frames
+    put32(out, 1);  // streams
     put32(out, std::uint32_t(largest));
     put32(out, std::uint32_t(clip.width));
     put32(out, std::uint32_t(clip.height));
@@ -197,17 +202,17 @@ inline std::vector<std::uint8_t> writeAvi(const Clip& clip, Encoding encoding)
     const std::size_t strh = open(out, "strh");
     putTag(out, "vids");
     putTag(out, rle ? "RLE " : "DIB ");
-    put32(out, 0);             // flags
-    put16(out, 0);             // priority
-    put16(out, 0);             // language
-    put32(out, 0);             // initial frames
+    put32(out, 0);                                         // flags
+    put16(out, 0);                                         // priority
+    put16(out, 0);                                         // language
+    put32(out, 0);                                         // initial frames
     put32(out, std::uint32_t(clip.microsecondsPerFrame));  // scale
-    put32(out, 1000000);       // rate: frames per second = rate / scale
-    put32(out, 0);             // start
-    put32(out, frames);        // length
+    put32(out, 1000000);                                   // rate: frames per second = rate / scale
+    put32(out, 0);                                         // start
+    put32(out, frames);                                    // length
     put32(out, std::uint32_t(largest));
-    put32(out, 0xffffffffu);   // quality
-    put32(out, 0);             // sample size
+    put32(out, 0xffffffffu);  // quality
+    put32(out, 0);            // sample size
     put16(out, 0);
     put16(out, 0);
     put16(out, std::uint32_t(clip.width));
@@ -220,7 +225,7 @@ inline std::vector<std::uint8_t> writeAvi(const Clip& clip, Encoding encoding)
     put32(out, std::uint32_t(clip.height));  // positive: bottom row first
     put16(out, 1);
     put16(out, paletted ? 8 : 24);
-    put32(out, rle ? 1 : 0);   // BI_RLE8 or BI_RGB
+    put32(out, rle ? 1 : 0);  // BI_RLE8 or BI_RGB
     put32(out, std::uint32_t(largest));
     put32(out, 0);
     put32(out, 0);

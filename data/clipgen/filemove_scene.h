@@ -13,7 +13,15 @@ namespace clipgen {
 
 namespace scene {
 
-enum Colour : std::uint8_t { Background, Outline, Folder, FolderShade, Paper, PaperLine, FolderFront };
+enum Colour : std::uint8_t {
+    Background,
+    Outline,
+    Folder,
+    FolderShade,
+    Paper,
+    PaperLine,
+    FolderFront
+};
 
 struct Canvas {
     int width;

@@ -9,9 +9,9 @@ namespace quotas {
 inline const QStringList& monthNames()
 {
     static const QStringList names = {
-        QStringLiteral("Janeiro"), QStringLiteral("Fevereiro"), QStringLiteral("Março"),    QStringLiteral("Abril"),
-        QStringLiteral("Maio"),    QStringLiteral("Junho"),     QStringLiteral("Julho"),    QStringLiteral("Agosto"),
-        QStringLiteral("Setembro"), QStringLiteral("Outubro"),  QStringLiteral("Novembro"), QStringLiteral("Dezembro")};
+        QStringLiteral("Janeiro"), QStringLiteral("Fevereiro"), QStringLiteral("Março"), QStringLiteral("Abril"),
+        QStringLiteral("Maio"), QStringLiteral("Junho"), QStringLiteral("Julho"), QStringLiteral("Agosto"),
+        QStringLiteral("Setembro"), QStringLiteral("Outubro"), QStringLiteral("Novembro"), QStringLiteral("Dezembro")};
     return names;
 }
 

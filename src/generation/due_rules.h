@@ -8,14 +8,17 @@
 namespace quotas {
 
 // The two dues a member is charged every month.
-enum class DueType { Sindicato = 1, Seguro = 2 };
+enum class DueType {
+    Sindicato = 1,
+    Seguro = 2
+};
 
 // What differs between the two dues when they are posted.
 struct DueTypeInfo {
     int tipo;
-    QString ref;             // written to the movement
-    QString personalRate;    // account column holding the member's own rate
-    QString amountColumn;    // account column receiving the last amount
+    QString ref;           // written to the movement
+    QString personalRate;  // account column holding the member's own rate
+    QString amountColumn;  // account column receiving the last amount
 };
 const DueTypeInfo& dueTypeInfo(DueType type);
 

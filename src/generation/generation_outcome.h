@@ -7,8 +7,8 @@ namespace quotas {
 
 // What a generation run did, and the dues it could not post.
 struct GenerationOutcome {
-    int members = 0;         // members visited
-    int posted = 0;          // movements created
+    int members = 0;  // members visited
+    int posted = 0;   // movements created
     int accountsCreated = 0;
     // Dues not posted because the account has no remuneration 1 or 2.
     int missingRemuneration = 0;

@@ -72,8 +72,8 @@ public:
             if (!m_account.lock(m_connection, no))
                 throw DbError(QStringLiteral("Não foi possível criar a conta de quotas do associado."));
         }
-        PostingContext ctx{m_connection, m_ano,     m_mes,     m_today,  member,
-                           m_account,    m_employers, m_counter, m_outcome, chargedTypes(m_connection, no, m_ano, m_mes)};
+        PostingContext ctx{m_connection, m_ano, m_mes, m_today, member,
+                           m_account, m_employers, m_counter, m_outcome, chargedTypes(m_connection, no, m_ano, m_mes)};
         LancarQuota(ctx, DueType::Sindicato);
         LancarQuota(ctx, DueType::Seguro);
         m_account.save(m_connection);

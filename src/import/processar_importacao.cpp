@@ -88,7 +88,11 @@ std::optional<double> readAmount(const QVariant& value, bool wholeCents)
     return roundCents(wholeCents ? *number / 100.0 : *number);
 }
 
-enum class Outcome { Posted, LeftAlone, Rejected };
+enum class Outcome {
+    Posted,
+    LeftAlone,
+    Rejected
+};
 
 // The run's state for the lines.
 struct Lines {
@@ -304,7 +308,7 @@ ImportSummary ProcessarImportacao(int month, int year, int tipo)
     if (movements.eof()) {
         msgBox(QStringLiteral("Não foram processados os registos de quotas referente a %1 / %2.").arg(month).arg(year));
     } else {
-        Lines lines{source,      movements,   accounts, connection, quotaColumn,
+        Lines lines{source, movements, accounts, connection, quotaColumn,
                     rend1Column, shared().SemSeparadorDecimal, month, year, tipo};
         while (!source.eof()) {
             ++summary.lines;

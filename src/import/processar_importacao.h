@@ -7,11 +7,11 @@ namespace quotas {
 // What a run did, for the command line and the tests; the user learns it
 // from the run's own messages.
 struct ImportSummary {
-    int lines = 0;           // source lines visited
-    int posted = 0;          // lines whose deduction was posted
-    int rejected = 0;        // lines listed in extras (failed ones included)
-    int failed = 0;          // matched lines whose writes were rolled back
-    bool extrasSaved = true; // false when extras could not be rewritten
+    int lines = 0;            // source lines visited
+    int posted = 0;           // lines whose deduction was posted
+    int rejected = 0;         // lines listed in extras (failed ones included)
+    int failed = 0;           // matched lines whose writes were rolled back
+    bool extrasSaved = true;  // false when extras could not be rewritten
 };
 
 // Posts the employer's list of deductions, obtained from the import source

@@ -35,7 +35,10 @@ struct ConnectionTarget {
 // per connection and reused; every value reaches them as a bound parameter.
 class Connection {
 public:
-    enum class OpenMode { Existing, CreateIfMissing };
+    enum class OpenMode {
+        Existing,
+        CreateIfMissing
+    };
 
     explicit Connection(QString name = QString());
     ~Connection();

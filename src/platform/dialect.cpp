@@ -6,7 +6,12 @@ namespace quotas {
 
 namespace {
 
-enum class TokenKind { Literal, Plus, Space, Other };
+enum class TokenKind {
+    Literal,
+    Plus,
+    Space,
+    Other
+};
 
 struct Token {
     TokenKind kind;

@@ -5,7 +5,10 @@
 
 namespace quotas {
 
-enum class Engine { SQLite, PostgreSQL };
+enum class Engine {
+    SQLite,
+    PostgreSQL
+};
 
 // Everything that differs between the two database engines lives here; the
 // system's SQL texts are written once and translated on their way out.

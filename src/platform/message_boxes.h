@@ -5,9 +5,25 @@
 
 namespace quotas {
 
-enum class Icon { None, Critical, Question, Exclamation, Information };
-enum class Buttons { Ok, OkCancel, YesNo, YesNoCancel };
-enum class Answer { Ok, Cancel, Yes, No };
+enum class Icon {
+    None,
+    Critical,
+    Question,
+    Exclamation,
+    Information
+};
+enum class Buttons {
+    Ok,
+    OkCancel,
+    YesNo,
+    YesNoCancel
+};
+enum class Answer {
+    Ok,
+    Cancel,
+    Yes,
+    No
+};
 
 // The one way the component talks to the user in a box: Qt dialogs in the
 // windows, a console in the command line, a script in the tests.

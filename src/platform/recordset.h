@@ -18,8 +18,20 @@ namespace quotas {
 class Connection;
 
 // Cursor and lock kinds with the numbers the runs and windows are written with.
-enum class Cursor { Unspecified = -1, ForwardOnly = 0, Keyset = 1, Dynamic = 2, Static = 3 };
-enum class Lock { Unspecified = -1, ReadOnly = 1, Pessimistic = 2, Optimistic = 3, BatchOptimistic = 4 };
+enum class Cursor {
+    Unspecified = -1,
+    ForwardOnly = 0,
+    Keyset = 1,
+    Dynamic = 2,
+    Static = 3
+};
+enum class Lock {
+    Unspecified = -1,
+    ReadOnly = 1,
+    Pessimistic = 2,
+    Optimistic = 3,
+    BatchOptimistic = 4
+};
 
 // A result set: the rows of one query read at open, a current row, and saves
 // of the changed columns back to each column's base table by primary key.

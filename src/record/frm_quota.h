@@ -50,22 +50,22 @@ public:
     // The data control: the rows Registo opened, on the movement shown.
     std::shared_ptr<Recordset> Adodc1;
 
-    QGroupBox* Frame1;  // "Quota"
-    QGroupBox* Frame2;  // "Importancias:"
-    QGroupBox* Frame3;  // "Associado:"
-    QLineEdit* Text1;   // data
-    QLineEdit* Text2;   // ano
-    QLineEdit* Text3;   // mes
-    QLineEdit* Text4;   // quota_no
-    QLineEdit* Text5;   // rend1, editable
-    QLineEdit* Text6;   // rend2, editable
-    QLineEdit* Text7;   // ref
-    QLineEdit* Text8;   // participation, editable, not bound
-    QLineEdit* Text9;   // quota
-    QLineEdit* Text10;  // no_tap
-    QLineEdit* Text11;  // nome
-    QLineEdit* Text12;  // nome_guerra
-    QLineEdit* Text13;  // the unpaid part, not bound
+    QGroupBox* Frame1;      // "Quota"
+    QGroupBox* Frame2;      // "Importancias:"
+    QGroupBox* Frame3;      // "Associado:"
+    QLineEdit* Text1;       // data
+    QLineEdit* Text2;       // ano
+    QLineEdit* Text3;       // mes
+    QLineEdit* Text4;       // quota_no
+    QLineEdit* Text5;       // rend1, editable
+    QLineEdit* Text6;       // rend2, editable
+    QLineEdit* Text7;       // ref
+    QLineEdit* Text8;       // participation, editable, not bound
+    QLineEdit* Text9;       // quota
+    QLineEdit* Text10;      // no_tap
+    QLineEdit* Text11;      // nome
+    QLineEdit* Text12;      // nome_guerra
+    QLineEdit* Text13;      // the unpaid part, not bound
     QPushButton* Command1;  // "&Anular"
     QPushButton* Command2;  // "&Liquidar"
     QPushButton* Command3;  // "&Sair"

@@ -27,7 +27,11 @@ enum class ItemKind {
     Sum,    // the sum of the column over the rows, through the item's format
 };
 
-enum class Align { Left, Center, Right };
+enum class Align {
+    Left,
+    Center,
+    Right
+};
 
 struct ReportItem {
     ItemKind kind = ItemKind::Label;
@@ -44,7 +48,13 @@ struct ReportItem {
     QColor fillColor = QColor(192, 192, 192);  // boxes
 };
 
-enum class BandKind { ReportHeader, PageHeader, Detail, PageFooter, ReportFooter };
+enum class BandKind {
+    ReportHeader,
+    PageHeader,
+    Detail,
+    PageFooter,
+    ReportFooter
+};
 
 struct ReportBand {
     QString name;

@@ -91,7 +91,8 @@ void drawText(QPainter& painter, const PlacedItem& placed)
     }
     // Too wide for its box: wrapped at words and kept inside the box.
     int flags = Qt::AlignTop | Qt::TextWordWrap;
-    flags |= item.align == Align::Center ? Qt::AlignHCenter : item.align == Align::Right ? Qt::AlignRight : Qt::AlignLeft;
+    flags |= item.align == Align::Center ? Qt::AlignHCenter : item.align == Align::Right ? Qt::AlignRight
+                                                                                         : Qt::AlignLeft;
     painter.save();
     painter.setClipRect(box, Qt::IntersectClip);
     painter.drawText(box, flags, placed.text);

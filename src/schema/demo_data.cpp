@@ -15,11 +15,11 @@ const char* const kMaleNames[] = {"João", "José", "António", "Manuel", "Franc
                                   "Pedro", "Rui", "Miguel", "Jorge", "Fernando", "Ricardo", "Nuno", "Vítor"};
 const char* const kFemaleNames[] = {"Maria", "Ana", "Isabel", "Rosa", "Teresa", "Helena", "Sofia", "Catarina",
                                     "Inês", "Joana", "Marta", "Fátima", "Conceição", "Graça", "Beatriz", "Lúcia"};
-const char* const kSurnames[] = {"Silva",    "Santos",  "Ferreira", "Pereira", "Oliveira", "Costa",  "Rodrigues",
-                                 "Martins",  "Jesus",   "Sousa",    "Fernandes", "Gonçalves", "Gomes", "Lopes",
-                                 "Marques",  "Alves",   "Almeida",  "Ribeiro", "Pinto",    "Carvalho", "Teixeira",
-                                 "Moreira",  "Correia", "Mendes",   "Nunes",   "Soares",   "Vieira", "Monteiro",
-                                 "Cardoso",  "Rocha",   "Raposo",   "Neves",   "Coelho",   "Cruz",   "Cunha"};
+const char* const kSurnames[] = {"Silva", "Santos", "Ferreira", "Pereira", "Oliveira", "Costa", "Rodrigues",
+                                 "Martins", "Jesus", "Sousa", "Fernandes", "Gonçalves", "Gomes", "Lopes",
+                                 "Marques", "Alves", "Almeida", "Ribeiro", "Pinto", "Carvalho", "Teixeira",
+                                 "Moreira", "Correia", "Mendes", "Nunes", "Soares", "Vieira", "Monteiro",
+                                 "Cardoso", "Rocha", "Raposo", "Neves", "Coelho", "Cruz", "Cunha"};
 const char* const kStreets[] = {"Rua Augusta", "Avenida da Liberdade", "Rua do Ouro", "Rua da Prata",
                                 "Avenida de Roma", "Rua Morais Soares", "Estrada de Benfica", "Rua de Santa Marta",
                                 "Avenida Almirante Reis", "Rua da Junqueira", "Calçada da Ajuda", "Rua do Carmo"};
@@ -27,9 +27,11 @@ struct Town {
     const char* postcode;
     const char* name;
 };
+// clang-format off
 const Town kTowns[] = {{"1100-053", "Lisboa"}, {"1700-111", "Lisboa"},  {"2700-356", "Amadora"},
                        {"2790-045", "Carnaxide"}, {"2685-223", "Portela"}, {"4000-322", "Porto"},
                        {"8000-164", "Faro"},    {"2910-512", "Setúbal"}, {"2600-098", "Vila Franca de Xira"}};
+// clang-format on
 
 // Categories and employers of the demo; members whose code is not among them
 // exercise the defaults of the dues generation.

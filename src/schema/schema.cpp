@@ -8,7 +8,17 @@ namespace quotas {
 
 namespace {
 
-enum class Kind { Key, Int, Money, Total, Rate, Text, LongText, Date, TextKey };
+enum class Kind {
+    Key,
+    Int,
+    Money,
+    Total,
+    Rate,
+    Text,
+    LongText,
+    Date,
+    TextKey
+};
 
 struct ColumnDef {
     const char* name;
@@ -43,6 +53,8 @@ QString typeOf(const ColumnDef& c, Engine engine)
     return QString();
 }
 
+// The table definitions keep their hand-made layout.
+// clang-format off
 std::vector<ColumnDef> accountColumns()
 {
     return {{"squota_id", Kind::Key},        {"socio_id", Kind::Int},           {"ult_ano", Kind::Int},
@@ -104,6 +116,7 @@ std::vector<TableDef> tables()
          {QStringLiteral("'M', 'Masculino'"), QStringLiteral("'F', 'Feminino'")}},
     };
 }
+// clang-format on
 
 }  // namespace
 

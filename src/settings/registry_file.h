@@ -31,12 +31,19 @@ public:
     void save(const QString& path) const;
 
 private:
-    enum : int { String = 1, ExpandString = 2, Binary = 3, Dword = 4, MultiString = 7, Qword = 11 };
+    enum : int {
+        String = 1,
+        ExpandString = 2,
+        Binary = 3,
+        Dword = 4,
+        MultiString = 7,
+        Qword = 11
+    };
     struct Value {
         QString name;  // empty: the key's default value "@"
         int type = String;
-        QString text;      // String
-        QByteArray bytes;  // every other type, as written in the file
+        QString text;           // String
+        QByteArray bytes;       // every other type, as written in the file
         bool wideText = false;  // hex(2)/hex(7) bytes are UTF-16 (version 5 files)
     };
     struct Key {

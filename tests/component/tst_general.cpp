@@ -66,8 +66,7 @@ private slots:
         auto component = createComponent(QStringLiteral("Velumo.General"));
         auto* window = qobject_cast<ProgressWindow*>(component.get());
         QVERIFY(window);
-        callByName(window, "Iniciar", {3, QStringLiteral("Criando registos de quotas, aguarde alguns momentos . . ."),
-                                       QStringLiteral("Processamento de Quotas")});
+        callByName(window, "Iniciar", {3, QStringLiteral("Criando registos de quotas, aguarde alguns momentos . . ."), QStringLiteral("Processamento de Quotas")});
         QVERIFY(window->isVisible());
         QCOMPARE(window->windowTitle(), QStringLiteral("Processamento de Quotas"));
         QCOMPARE(window->findChild<QLabel*>()->text(), QStringLiteral("Criando registos de quotas, aguarde alguns momentos . . ."));

@@ -37,14 +37,22 @@ private slots:
         QTest::addColumn<QString>("locale");
         QTest::addColumn<bool>("ok");
         QTest::addColumn<double>("value");
-        QTest::newRow("comma decimal") << "1234,56" << "pt_PT" << true << 1234.56;
-        QTest::newRow("grouped") << "1.234,56" << "de_DE" << true << 1234.56;
-        QTest::newRow("point decimal") << "99999999.99" << "C" << true << 99999999.99;
-        QTest::newRow("sign and spaces") << " -3 " << "C" << true << -3.0;
-        QTest::newRow("wrong separator is refused") << "12,50" << "C" << false << 0.0;
-        QTest::newRow("letters") << "12a" << "C" << false << 0.0;
-        QTest::newRow("empty") << "" << "C" << false << 0.0;
-        QTest::newRow("blank") << "   " << "pt_PT" << false << 0.0;
+        QTest::newRow("comma decimal") << "1234,56"
+                                       << "pt_PT" << true << 1234.56;
+        QTest::newRow("grouped") << "1.234,56"
+                                 << "de_DE" << true << 1234.56;
+        QTest::newRow("point decimal") << "99999999.99"
+                                       << "C" << true << 99999999.99;
+        QTest::newRow("sign and spaces") << " -3 "
+                                         << "C" << true << -3.0;
+        QTest::newRow("wrong separator is refused") << "12,50"
+                                                    << "C" << false << 0.0;
+        QTest::newRow("letters") << "12a"
+                                 << "C" << false << 0.0;
+        QTest::newRow("empty") << ""
+                               << "C" << false << 0.0;
+        QTest::newRow("blank") << "   "
+                               << "pt_PT" << false << 0.0;
     }
     void readsTypedAmounts()
     {
@@ -63,11 +71,16 @@ private slots:
         QTest::addColumn<double>("amount");
         QTest::addColumn<QString>("locale");
         QTest::addColumn<QString>("text");
-        QTest::newRow("plain") << 6.0 << "C" << "€ 6.00";
-        QTest::newRow("grouping") << 1234567.891 << "C" << "€ 1,234,567.89";
-        QTest::newRow("negative in parentheses") << -2.5 << "C" << "(€ 2.50)";
-        QTest::newRow("user's separators") << 1234.5 << "de_DE" << "€ 1.234,50";
-        QTest::newRow("tiny negative is zero") << -0.004 << "C" << "€ 0.00";
+        QTest::newRow("plain") << 6.0 << "C"
+                               << "€ 6.00";
+        QTest::newRow("grouping") << 1234567.891 << "C"
+                                  << "€ 1,234,567.89";
+        QTest::newRow("negative in parentheses") << -2.5 << "C"
+                                                 << "(€ 2.50)";
+        QTest::newRow("user's separators") << 1234.5 << "de_DE"
+                                           << "€ 1.234,50";
+        QTest::newRow("tiny negative is zero") << -0.004 << "C"
+                                               << "€ 0.00";
     }
     void formatsMoney()
     {

@@ -158,8 +158,7 @@ private slots:
         QTest::addColumn<Due>("d");
         QTest::newRow("employer unknown: 1.5%") << Due{.empresa = "XPT"};
         QTest::newRow("personal rate, employer's for the other") << Due{.percSindicato = 0.02, .dues = "20|15", .total = "45.1"};
-        QTest::newRow("personal 0 or below: the employer's") << Due{.empresa = "PGA", .rend2 = 200, .percSindicato = 0.0,
-                                                                     .percSeguro = -0.5, .dues = "12|12", .total = "34.1"};
+        QTest::newRow("personal 0 or below: the employer's") << Due{.empresa = "PGA", .rend2 = 200, .percSindicato = 0.0, .percSeguro = -0.5, .dues = "12|12", .total = "34.1"};
         QTest::newRow("the employer's 0 stands") << Due{.empresa = "ZER", .dues = "0|0", .total = "10.1"};
         QTest::newRow("12.5 and 37.5 cents to even")
             << Due{.rend1 = 1, .percSindicato = 0.125, .percSeguro = 0.375, .dues = "0.12|0.38", .total = "10.6"};
@@ -182,7 +181,10 @@ private slots:
         QStringList movements;
         for (const QString& quota : d.dues.split(u'|'))
             movements << QStringLiteral("%1|2003-01-20|%2|%3|%4|0")
-                             .arg(movements.isEmpty() ? "Sindicato" : "Seguro").arg(d.rend1, 0, 'f', 0).arg(d.rend2).arg(quota);
+                             .arg(movements.isEmpty() ? "Sindicato" : "Seguro")
+                             .arg(d.rend1, 0, 'f', 0)
+                             .arg(d.rend2)
+                             .arg(quota);
         QCOMPARE(rows("SELECT ref, data, rend1, rend2, quota, pago FROM tbQuotas_Movimentos ORDER BY tipo"), movements);
         QCOMPARE(rows("SELECT total_quotas, ult_ano, ult_mes FROM tbQuotas_Socios"), QStringList{d.total + "|2000|12"});
     }
@@ -361,7 +363,7 @@ private slots:
         QCOMPARE(told(boxes), c.shown);
         QCOMPARE(dues(c.ano, c.mes), c.dues);
         QCOMPARE(d.isVisible(), !c.yes);  // closed after a run
-        if (!c.yes)  // left as it was
+        if (!c.yes)                       // left as it was
             QCOMPARE(QStringList({d.List1->currentItem()->text(), d.List2->currentItem()->text(), d.No_Tap->text(),
                                   d.Text2->text(), QString::number(d.selectedMember())}),
                      QStringList({"2001", "Março", "1003", "Associado 3", "3"}));
@@ -389,14 +391,18 @@ private slots:
         connect(&answerer, &QTimer::timeout, this, [&] {
             if (auto* box = qobject_cast<QMessageBox*>(QApplication::activeModalWidget())) {
                 shown << QStringLiteral("%1 %2 [%3] %4")
-                             .arg(box->icon()).arg(box->standardButtons().toInt()).arg(box->windowTitle(), box->text());
+                             .arg(box->icon())
+                             .arg(box->standardButtons().toInt())
+                             .arg(box->windowTitle(), box->text());
                 QTest::keyClick(box, Qt::Key_Return);
             }
         });
         answerer.start(20);
         typeStaffNumber(typed, Qt::Key(leave));
         const QString unknown = QStringLiteral("%1 %2 [%3] Número de Empresa não existe!")
-                                    .arg(QMessageBox::Information).arg(QMessageBox::Ok).arg(applicationTitle());
+                                    .arg(QMessageBox::Information)
+                                    .arg(QMessageBox::Ok)
+                                    .arg(applicationTitle());
         QCOMPARE(shown, QStringList{unknown});
         QApplication::setActiveWindow(&d);  // what the desktop does once the box is gone
         QCOMPARE(QApplication::focusWidget(), d.No_Tap);

@@ -20,16 +20,36 @@ private slots:
         QTest::addColumn<QString>("find");
         QTest::addColumn<QString>("replacement");
         QTest::addColumn<QString>("result");
-        QTest::newRow("number to SQL") << QVariant(12.5) << "," << "." << "12.5";
-        QTest::newRow("no grouping in numbers") << QVariant(1234567.25) << "," << "." << "1234567.25";
-        QTest::newRow("whole number") << QVariant(100000) << "," << "." << "100000";
-        QTest::newRow("text with points") << QVariant(QStringLiteral("1.234.5")) << "." << "," << "1,234,5";
-        QTest::newRow("nothing to replace") << QVariant(QStringLiteral("abc")) << "." << "," << "abc";
-        QTest::newRow("case matters") << QVariant(QStringLiteral("aAa")) << "A" << "x" << "axa";
-        QTest::newRow("empty find") << QVariant(QStringLiteral("a.b")) << "" << "," << "";
-        QTest::newRow("two-character find") << QVariant(QStringLiteral("abc")) << "ab" << "x" << "";
-        QTest::newRow("empty replacement") << QVariant(QStringLiteral("a.b")) << "." << "" << "";
-        QTest::newRow("two-character replacement") << QVariant(QStringLiteral("zzz")) << "." << ",," << "";
+        QTest::newRow("number to SQL") << QVariant(12.5) << ","
+                                       << "."
+                                       << "12.5";
+        QTest::newRow("no grouping in numbers") << QVariant(1234567.25) << ","
+                                                << "."
+                                                << "1234567.25";
+        QTest::newRow("whole number") << QVariant(100000) << ","
+                                      << "."
+                                      << "100000";
+        QTest::newRow("text with points") << QVariant(QStringLiteral("1.234.5")) << "."
+                                          << ","
+                                          << "1,234,5";
+        QTest::newRow("nothing to replace") << QVariant(QStringLiteral("abc")) << "."
+                                            << ","
+                                            << "abc";
+        QTest::newRow("case matters") << QVariant(QStringLiteral("aAa")) << "A"
+                                      << "x"
+                                      << "axa";
+        QTest::newRow("empty find") << QVariant(QStringLiteral("a.b")) << ""
+                                    << ","
+                                    << "";
+        QTest::newRow("two-character find") << QVariant(QStringLiteral("abc")) << "ab"
+                                            << "x"
+                                            << "";
+        QTest::newRow("empty replacement") << QVariant(QStringLiteral("a.b")) << "."
+                                           << ""
+                                           << "";
+        QTest::newRow("two-character replacement") << QVariant(QStringLiteral("zzz")) << "."
+                                                   << ",,"
+                                                   << "";
     }
     void replaces()
     {

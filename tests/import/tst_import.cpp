@@ -329,7 +329,7 @@ private slots:
                 "999;7.00;Jo\xC3\xA3o;x\n"
                 "200;abc;Rui;y\n"
                 "300;6.00;Sem conta;z\n"
-                "400;;Vazio\n"  // an empty amount; the short line leaves obs Null
+                "400;;Vazio\n"                                                      // an empty amount; the short line leaves obs Null
                 "998;1;a;b;4;5;6;7;8;9;10;11;12;13;14;15;16;17;18;19;20;21;22\n");  // only 21 values are kept
         ScriptedBoxes boxes;
         QCOMPARE(run().posted, 1);

@@ -18,8 +18,7 @@ namespace quotas::test {
 
 // The tables by their short names.
 inline const QHash<QString, QString> kTable = {
-    {"SA", "tbQuotas_Socios"}, {"SI", "tbQuotas_Socios_Inactivos"}, {"A", "tbQuotas_Movimentos"},
-    {"I", "tbQuotas_Movimentos_Inactivos"}, {"H", "tbQuotas_Movimentos_Historico"}};
+    {"SA", "tbQuotas_Socios"}, {"SI", "tbQuotas_Socios_Inactivos"}, {"A", "tbQuotas_Movimentos"}, {"I", "tbQuotas_Movimentos_Inactivos"}, {"H", "tbQuotas_Movimentos_Historico"}};
 
 // Accounts get ult_ano 2003 and nothing else; every movement a month of its
 // own, so the active table's one-due-a-month rule never trips.
@@ -34,10 +33,12 @@ inline void insertRows(Connection& c, const QStringList& lines)
         const int n = next++;
         if (f[0].startsWith(u'S'))
             c.execute(QStringLiteral("INSERT INTO %1 (socio_id, ult_ano, total_quotas, total_pago) VALUES (?, 2003, ?, ?)")
-                          .arg(kTable[f[0]]), v);
+                          .arg(kTable[f[0]]),
+                      v);
         else
             c.execute(QStringLiteral("INSERT INTO %1 (socio_id, data, ano, mes, quota_no, tipo, ref, rend1, rend2, quota, pago) "
-                                     "VALUES (?, ?, ?, ?, ?, 1, 'Sindicato', ?, ?, ?, ?)").arg(kTable[f[0]]),
+                                     "VALUES (?, ?, ?, ?, ?, 1, 'Sindicato', ?, ?, ?, ?)")
+                          .arg(kTable[f[0]]),
                       QVariantList{v[0], QDate(2000 + n / 12, 1 + n % 12, 1), 2000 + n / 12, 1 + n % 12, n}
                           + (v.size() == 3 ? QVariantList{1000.0, 0.0} : QVariantList()) + v.mid(1));
     }
@@ -53,12 +54,12 @@ inline QStringList stateOf(Connection& c)
         Recordset rs;
         rs.open((key.startsWith(u'S') ? QStringLiteral("SELECT socio_id, total_quotas, total_pago, ult_ano FROM %1 ORDER BY socio_id")
                                       : QStringLiteral("SELECT socio_id, rend1, rend2, quota, pago FROM %1 ORDER BY quota_id"))
-                    .arg(kTable[key]), c);
+                    .arg(kTable[key]),
+                c);
         for (; !rs.eof(); rs.moveNext()) {
             QString row = key;
             for (int i = 0; i < rs.fieldCount(); ++i)
-                row += u' ' + (rs.value(i).isNull() ? QStringLiteral("-")
-                                                     : QString::number(rs.value(i).toDouble(), 'g', QLocale::FloatingPointShortest));
+                row += u' ' + (rs.value(i).isNull() ? QStringLiteral("-") : QString::number(rs.value(i).toDouble(), 'g', QLocale::FloatingPointShortest));
             rows << row;
         }
     }
@@ -79,7 +80,8 @@ inline void failUpdates(Connection& c, const QString& table, const QString& cond
                       .arg(trigger, table, condition));
     if (!condition.isEmpty() && !lite) {
         c.execute(QStringLiteral("CREATE OR REPLACE FUNCTION %1() RETURNS trigger AS $$ BEGIN IF %2 THEN "
-                                 "RAISE EXCEPTION 'falha simulada'; END IF; RETURN NEW; END $$ LANGUAGE plpgsql").arg(trigger, condition));
+                                 "RAISE EXCEPTION 'falha simulada'; END IF; RETURN NEW; END $$ LANGUAGE plpgsql")
+                      .arg(trigger, condition));
         c.execute(QStringLiteral("CREATE TRIGGER %1 BEFORE UPDATE ON %2 FOR EACH ROW EXECUTE FUNCTION %1()").arg(trigger, table));
     }
 }

@@ -32,11 +32,19 @@ namespace {
 // A run from the seed rows to the state, with the bars (value/maximum) as
 // the closing box shows; a failing one fails the updates of the table (SA or
 // A) where the condition holds, and stops in the stage.
-struct Case { QStringList seed, state; QString bars, table = {}, condition = {}, stage = {}; };
+struct Case {
+    QStringList seed, state;
+    QString bars, table = {}, condition = {}, stage = {};
+};
 
 // "quotas manutencao" with the arguments, the account updates failing where
 // the condition holds: what it prints (stderr containing err) and leaves.
-struct CliCase { QStringList args; QString condition; CliRun expected; QStringList state; };
+struct CliCase {
+    QStringList args;
+    QString condition;
+    CliRun expected;
+    QStringList state;
+};
 
 const QStringList kData = {"SA 1 99 99", "A 1 - 0 12.5 -", "A 2 3.2 3.2", "I 3 4 0"};
 const QString kDone = QStringLiteral("Manutenção de Dados Concluída.");
@@ -94,7 +102,8 @@ private slots:
         // other movement, on any run, fails the run.
         for (const QString key : {"A", "I", "H"})
             failUpdates(c(), kTable[key], QStringLiteral("OLD.rend1 IS NOT NULL AND OLD.rend2 IS NOT NULL AND OLD.quota IS NOT NULL "
-                                                          "AND OLD.pago IS NOT NULL"), QStringLiteral("clean"));
+                                                         "AND OLD.pago IS NOT NULL"),
+                        QStringLiteral("clean"));
     }
     void cleanupTestCase() { db.reset(); }
     void init()
@@ -117,10 +126,10 @@ private slots:
         // no account gets one holding only the member and the totals.
         QTest::newRow("new account beside one without movements")
             << Case{{"SA 1 7 3", "SA 9 0 0", "A 5 10.25 4", "A 5 10.25 0"},
-                    {"SA 1 0 0 2003", "SA 5 20.5 4 -", "SA 9 0 0 2003", "A 5 1000 0 10.25 4", "A 5 1000 0 10.25 0"}, "2/2 1/1 1/1 1/1 1/1"};
+                    {"SA 1 0 0 2003", "SA 5 20.5 4 -", "SA 9 0 0 2003", "A 5 1000 0 10.25 4", "A 5 1000 0 10.25 0"},
+                    "2/2 1/1 1/1 1/1 1/1"};
         QTest::newRow("new accounts, account table empty")
-            << Case{{"A 5 10.25 4", "A 6 3 3"}, {"SA 5 10.25 4 -", "SA 6 3 3 -", "A 5 1000 0 10.25 4", "A 6 1000 0 3 3"},
-                    "2/2 1/1 1/1 2/2 1/1"};
+            << Case{{"A 5 10.25 4", "A 6 3 3"}, {"SA 5 10.25 4 -", "SA 6 3 3 -", "A 5 1000 0 10.25 4", "A 6 1000 0 3 3"}, "2/2 1/1 1/1 2/2 1/1"};
         // 0.1 + 0.1 + 0.1 is not 0.3 in binary; a stored total must be.
         const QStringList tenths(3, QStringLiteral("A 1 1000 0 0.1 0.1"));
         QTest::newRow("totals in whole cents") << Case{tenths, QStringList{"SA 1 0.3 0.3 -"} + tenths, "3/3 1/1 1/1 1/1 1/1"};
@@ -138,11 +147,13 @@ private slots:
             << Case{{"SA 1 50 20", "SA 2 50 20", "SA 3 50 20", "SI 1 30 30", "A 1 10 1", "A 2 - 0 20 1", "A 3 30 1"},
                     {"SA 1 50 20 2003", "SA 2 50 20 2003", "SA 3 50 20 2003", "SI 1 30 30 2003", "A 1 1000 0 10 1", "A 2 0 0 20 1",
                      "A 3 1000 0 30 1"},
-                    "3/3 1/1 1/1 2/3 0/100", "SA", "NEW.socio_id = 3 AND NEW.total_quotas <> 0", "Acumulados Activos"};
+                    "3/3 1/1 1/1 2/3 0/100",
+                    "SA",
+                    "NEW.socio_id = 3 AND NEW.total_quotas <> 0",
+                    "Acumulados Activos"};
         // The Null repair saves row by row: the rows before the failure stay repaired.
         QTest::newRow("failure repairing Nulls")
-            << Case{{"A 1 - 0 1 0", "A 2 - 0 1 0", "A 3 - 0 1 0"}, {"A 1 0 0 1 0", "A 2 - 0 1 0", "A 3 - 0 1 0"},
-                    "1/3 0/100 0/100 0/100 0/100", "A", "NEW.socio_id = 2", "Movimentos Activos"};
+            << Case{{"A 1 - 0 1 0", "A 2 - 0 1 0", "A 3 - 0 1 0"}, {"A 1 0 0 1 0", "A 2 - 0 1 0", "A 3 - 0 1 0"}, "1/3 0/100 0/100 0/100 0/100", "A", "NEW.socio_id = 2", "Movimentos Activos"};
     }
 
     void iniciarRuns()
@@ -153,7 +164,8 @@ private slots:
         if (failing)
             failUpdates(c(), kTable[k.table], k.condition);
         const QStringList pass = {"Iniciar(2, Recebendo informação do servidor, aguarde alguns momentos . . ., "
-                                  "Manutenção da Base de Dados)", "setvalor(2)", "terminar()"};
+                                  "Manutenção da Base de Dados)",
+                                  "setvalor(2)", "terminar()"};
         for (int round = 1; round <= 2; ++round) {  // the second finds the same totals and no Null
             RecordingProgress::install();
             FrmManutencaoDados d;
@@ -175,7 +187,8 @@ private slots:
             }
             // Regression: it says where and why it stopped, and "&Iniciar" stays for another try.
             QVERIFY2(boxes.last().text.startsWith(QStringLiteral("A manutenção de dados foi interrompida em \"%1\"").arg(k.stage))
-                         && boxes.last().text.contains(QStringLiteral("falha simulada")), qPrintable(boxes.last().text));
+                         && boxes.last().text.contains(QStringLiteral("falha simulada")),
+                     qPrintable(boxes.last().text));
             QCOMPARE(boxes.last().icon, Icon::Critical);
             failUpdates(c(), kTable[k.table]);
             QTest::mouseClick(d.Command1, Qt::LeftButton);
@@ -248,13 +261,9 @@ private slots:
     void commandLine_data()
     {
         QTest::addColumn<CliCase>("k");
-        QTest::newRow("complete") << CliCase{{"manutencao"}, {}, {0, kDone + u'\n', "Acumulados Inactivos: 1/1"},
-                                             {"SA 1 12.5 0 2003", "SI 2 4 4 -", "A 1 0 0 12.5 0", "I 2 1000 0 4 4"}};
-        QTest::newRow("failure") << CliCase{{"manutencao"}, "NEW.total_quotas <> 0",
-                                            {1, "", "quotas: A manutenção de dados foi interrompida em \"Acumulados Activos\""},
-                                            {"SA 1 80 10 2003", "A 1 0 0 12.5 0", "I 2 1000 0 4 4"}};
-        QTest::newRow("stray argument") << CliCase{{"manutencao", "now"}, {}, {2, "", "quotas:"},
-                                                   {"SA 1 80 10 2003", "A 1 - 0 12.5 -", "I 2 1000 0 4 4"}};
+        QTest::newRow("complete") << CliCase{{"manutencao"}, {}, {0, kDone + u'\n', "Acumulados Inactivos: 1/1"}, {"SA 1 12.5 0 2003", "SI 2 4 4 -", "A 1 0 0 12.5 0", "I 2 1000 0 4 4"}};
+        QTest::newRow("failure") << CliCase{{"manutencao"}, "NEW.total_quotas <> 0", {1, "", "quotas: A manutenção de dados foi interrompida em \"Acumulados Activos\""}, {"SA 1 80 10 2003", "A 1 0 0 12.5 0", "I 2 1000 0 4 4"}};
+        QTest::newRow("stray argument") << CliCase{{"manutencao", "now"}, {}, {2, "", "quotas:"}, {"SA 1 80 10 2003", "A 1 - 0 12.5 -", "I 2 1000 0 4 4"}};
     }
 
     void commandLine()

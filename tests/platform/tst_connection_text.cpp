@@ -17,14 +17,22 @@ private slots:
     {
         QTest::addColumn<QString>("value");
         QTest::addColumn<QString>("written");
-        QTest::newRow("plain") << "sa" << "sa";
-        QTest::newRow("empty") << "" << "";
-        QTest::newRow("semicolon") << "a;Provider=X" << "\"a;Provider=X\"";
-        QTest::newRow("double quote") << "pa\"ss" << "'pa\"ss'";
-        QTest::newRow("single quote") << "o'neil" << "\"o'neil\"";
-        QTest::newRow("both quotes") << "a'b\";c" << "\"a'b\"\";c\"";
-        QTest::newRow("outer spaces") << " x " << "\" x \"";
-        QTest::newRow("equals sign") << "a=b" << "a=b";
+        QTest::newRow("plain") << "sa"
+                               << "sa";
+        QTest::newRow("empty") << ""
+                               << "";
+        QTest::newRow("semicolon") << "a;Provider=X"
+                                   << "\"a;Provider=X\"";
+        QTest::newRow("double quote") << "pa\"ss"
+                                      << "'pa\"ss'";
+        QTest::newRow("single quote") << "o'neil"
+                                      << "\"o'neil\"";
+        QTest::newRow("both quotes") << "a'b\";c"
+                                     << "\"a'b\"\";c\"";
+        QTest::newRow("outer spaces") << " x "
+                                      << "\" x \"";
+        QTest::newRow("equals sign") << "a=b"
+                                     << "a=b";
     }
     void quotingKeepsEveryValueWhole()
     {
@@ -83,10 +91,14 @@ private slots:
                                 << "Select *, code || ' - ' || descrit as completo from tbmeses";
         QTest::newRow("postcode") << "a.code_postal1 + ' ' + a.localidade1 as x"
                                   << "a.code_postal1 || ' ' || a.localidade1 as x";
-        QTest::newRow("arithmetic stays") << "total_quotas + 1, a + b" << "total_quotas + 1, a + b";
-        QTest::newRow("plus inside a literal") << "'a + b' + c" << "'a + b' || c";
-        QTest::newRow("quote doubled in literal") << "'it''s' + x" << "'it''s' || x";
-        QTest::newRow("placeholder") << "x + ? , ? + 'a'" << "x + ? , ? || 'a'";
+        QTest::newRow("arithmetic stays") << "total_quotas + 1, a + b"
+                                          << "total_quotas + 1, a + b";
+        QTest::newRow("plus inside a literal") << "'a + b' + c"
+                                               << "'a + b' || c";
+        QTest::newRow("quote doubled in literal") << "'it''s' + x"
+                                                  << "'it''s' || x";
+        QTest::newRow("placeholder") << "x + ? , ? + 'a'"
+                                     << "x + ? , ? || 'a'";
     }
     void concatenationBecomesPipes()
     {

@@ -60,7 +60,7 @@ const QString documentBox = u"Tipo de Documento [] Indique o documento comprovat
 const QString overBox = u"Pagamento (question, yes/no) A importância de € %1 é superior ao valor por liquidar (€ 10.00)."_s;
 const QString question = u"Quotizações (question, yes/no) Quer eliminar este registo?"_s;
 const QString lastValues = u"ult_ano=%1; ult_mes=%2; ult_rend1=700; ult_rend2=300.1; ult_quota_sindicato=%3; ult_perc_sindicato=%4; "
-                            "ult_quota_seguro=%5; ult_perc_seguro=%6; total_quotas=%7; total_pago=%8"_s;
+                           "ult_quota_seguro=%5; ult_perc_seguro=%6; total_quotas=%7; total_pago=%8"_s;
 
 struct Edit {
     MovementRow row;
@@ -120,7 +120,8 @@ class RecordWindowTest : public QObject {
     {
         db->connection().execute(u"INSERT INTO tbQuotas_Socios (socio_id, ult_ano, ult_mes, ult_rend1, ult_rend2, ult_quota_sindicato, "
                                  "ult_perc_sindicato, ult_quota_seguro, ult_perc_seguro, total_quotas, total_pago) "
-                                 "VALUES (1, 2001, 11, 1.0, 2.0, 3.0, 0.5, 4.0, 0.25, ?, ?)"_s, {totalQuotas, totalPago});
+                                 "VALUES (1, 2001, 11, 1.0, 2.0, 3.0, 0.5, 4.0, 0.25, ?, ?)"_s,
+                                 {totalQuotas, totalPago});
     }
 
     // The columns named in expected ("pago=4; doc_no=R"), read from the movement
@@ -139,7 +140,8 @@ class RecordWindowTest : public QObject {
         for (int i = 0; i < columns.size() && (i > 0 || q.next()); ++i) {  // nothing when there is no row
             bool number = false;
             const double d = q.value(i).toDouble(&number);
-            values << columns[i] + u'=' + (q.value(i).isNull() ? u"null"_s : number ? QString::number(d, 'g', 12) : q.value(i).toString());
+            values << columns[i] + u'=' + (q.value(i).isNull() ? u"null"_s : number ? QString::number(d, 'g', 12)
+                                                                                    : q.value(i).toString());
         }
         q.finish();
         return values.isEmpty() ? u"none"_s : values.join(u"; "_s);
@@ -356,29 +358,32 @@ private slots:
         RecordingCaller recording;
         recording.fail = e.caller == "failing"_L1;
         QObject silent;
-        QObject* caller = e.caller == "none"_L1 ? nullptr : e.caller == "silent"_L1 ? &silent : &recording;
+        QObject* caller = e.caller == "none"_L1 ? nullptr : e.caller == "silent"_L1 ? &silent
+                                                                                    : &recording;
         const bool unknownKey = e.caller == "unknown key"_L1;
-        QVERIFY(open(unknownKey ? QVariant(id.toLongLong() + 100) : id, [&](FrmQuota& frm) {
-            if (e.disturbance == "another user"_L1)
-                pay(*other, id, 6.0);
-            if (*e.rend1)
-                type(frm.Text5, QString::fromLatin1(e.rend1));
-            if (down && e.button == "Command3"_L1)
-                connection.close();
-            if (e.button == "close"_L1)
-                frm.close();
-            else
-                click(frm.findChild<QPushButton*>(QString::fromLatin1(e.button)));
-            QCOMPARE(frm.isVisible(), !e.closes);
-            if (down) {
-                connection.open();
-                click(frm.Command3);
-            }
-        }, caller));
+        QVERIFY(open(
+            unknownKey ? QVariant(id.toLongLong() + 100) : id, [&](FrmQuota& frm) {
+                if (e.disturbance == "another user"_L1)
+                    pay(*other, id, 6.0);
+                if (*e.rend1)
+                    type(frm.Text5, QString::fromLatin1(e.rend1));
+                if (down && e.button == "Command3"_L1)
+                    connection.close();
+                if (e.button == "close"_L1)
+                    frm.close();
+                else
+                    click(frm.findChild<QPushButton*>(QString::fromLatin1(e.button)));
+                QCOMPARE(frm.isVisible(), !e.closes);
+                if (down) {
+                    connection.open();
+                    click(frm.Command3);
+                }
+            },
+            caller));
         QCOMPARE(described(boxes), e.boxes);
         QCOMPARE(read(e.movement, unknownKey ? first : id) + u" | "_s + read(e.account), e.movement + u" | "_s + e.account);
         QCOMPARE(recording.keys, caller == &recording ? QVariantList{unknownKey ? first : id} : QVariantList());  // however it closed
-        QTRY_VERIFY(shared().frmQuota.isNull());  // unloaded: the next Registo builds a fresh one
+        QTRY_VERIFY(shared().frmQuota.isNull());                                                                  // unloaded: the next Registo builds a fresh one
     }
 
     void paymentsRecordedAtTheSameMomentAreAllKept()
@@ -431,8 +436,7 @@ private slots:
         const QPoint older = movements->visualItemRect(movements->item(1, 0)).center();
         QVERIFY(drive([&] {
             QTest::mouseClick(movements->viewport(), Qt::LeftButton, {}, older);
-            QTest::mouseDClick(movements->viewport(), Qt::LeftButton, {}, older);
-        }, [&](FrmQuota& frm) { click(frm.Command2); }));
+            QTest::mouseDClick(movements->viewport(), Qt::LeftButton, {}, older); }, [&](FrmQuota& frm) { click(frm.Command2); }));
         QCOMPARE(read(u"pago"_s, january), u"pago=4"_s);
         QCOMPARE(window.currentMovement(), january);  // selected again, both lists refreshed
         QCOMPARE(movements->item(movements->currentRow(), 8)->text() + window.members()->item(window.members()->currentRow(), 3)->text(),

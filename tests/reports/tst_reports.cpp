@@ -90,8 +90,7 @@ QString describe(const ReportDocument& doc, const QString& name, int top)
     const ReportFont& f = p.item->font;
     const QRect r = p.rect.translated(-PaperSetup::leftMargin(*doc.layout), -top);
     const char* aligns[] = {"left", "center", "right"};
-    return u"%1 | %2,%3 %4x%5 | %6 %7%8%9 | %10"_s.arg(p.text).arg(r.left()).arg(r.top()).arg(r.width()).arg(r.height())
-        .arg(f.family).arg(f.pointSize).arg(f.bold ? " bold" : "", f.italic ? " italic" : "", aligns[int(p.item->align)]);
+    return u"%1 | %2,%3 %4x%5 | %6 %7%8%9 | %10"_s.arg(p.text).arg(r.left()).arg(r.top()).arg(r.width()).arg(r.height()).arg(f.family).arg(f.pointSize).arg(f.bold ? " bold" : "", f.italic ? " italic" : "", aligns[int(p.item->align)]);
 }
 
 // A layout of one detail and a report footer with a count, laid out over rows numbered 1 to count.
@@ -174,7 +173,8 @@ class ReportsTest : public QObject {
         });
         closer.start(10);
         General general;
-        report == "listing"_L1 ? general.ListagemDividas() : report == "letters"_L1 ? general.CartasDividas() : showRejectsListing();
+        report == "listing"_L1 ? general.ListagemDividas() : report == "letters"_L1 ? general.CartasDividas()
+                                                                                    : showRejectsListing();
         if (shown.size() != 1 || pageCounts != QList<int>{shown.front().pageCount()})
             qFatal("expected one preview of all the pages, got %d documents and %d dialogs", int(shown.size()), int(titles.size()));
         return shown.front();
@@ -276,8 +276,12 @@ private slots:
             const char* name;
             double charged, paid;
         } accounts[] = {{1, "Rui", 50, 0}, {2, "Nuno", 1.00, 0}, {3, "Ivo", 2.2, 1.2},  // 2.20 - 1.20 is a hair above 1 in REAL
-                        {4, "Maria", 1.01, 0}, {5, "Carla", 0.7 + 0.41, 0.1}, {6, "Bruno", 10, 30}, {7, "Eva", 12345.67, 0.67},
-                        {9, "Ana", 5, 0}, {8, "Ana", 5, 0}};  // equal names keep the accounts' order
+                        {4, "Maria", 1.01, 0},
+                        {5, "Carla", 0.7 + 0.41, 0.1},
+                        {6, "Bruno", 10, 30},
+                        {7, "Eva", 12345.67, 0.67},
+                        {9, "Ana", 5, 0},
+                        {8, "Ana", 5, 0}};  // equal names keep the accounts' order
         for (const auto& a : accounts)
             addDebtor(a.id, QString::number(100 + a.id), QString::fromUtf8(a.name), a.charged, a.paid);
         addDebtor(10, null, u"Paulo"_s, 20);  // in the total, not in the number of records
@@ -423,8 +427,7 @@ private slots:
                                                                "listados: 2\nTotal de Dívidas: 1.312,75 Esc\nProcessado por Computador Página: 1 / 1"};
         const QString letter = u"Sindicato de Ensaio\nRua Direita, 7, 3000-001 Coimbra\nAssociado: %1\nLocalidade: %2\n"
                                "Assunto: Regularização de Débitos\nna presente data, de ESC: %3\nA Direcção"_s;
-        QTest::newRow("cartas") << "cartas" << QStringList{letter.arg("Ana Conceição", "4000-322 Porto", "12,50 Esc"),
-                                                           letter.arg("Joaquim Gonçalves", "1100-053 Lisboa", "1.300,25 Esc")};
+        QTest::newRow("cartas") << "cartas" << QStringList{letter.arg("Ana Conceição", "4000-322 Porto", "12,50 Esc"), letter.arg("Joaquim Gonçalves", "1100-053 Lisboa", "1.300,25 Esc")};
         QTest::newRow("rejeitados") << "rejeitados" << QStringList{"Listagem de Dados não Importados para a Base de Dados\n"
                                                                    "Campo 1 Campo 2 Campo 3 Campo 4\n999001 Linha Rejeitada 12,50 TAP"};
     }
@@ -443,8 +446,7 @@ private slots:
         text.start(u"pdftotext"_s, {u"-layout"_s, pdf, u"-"_s});
         fonts.start(u"pdffonts"_s, {pdf});
         QVERIFY(text.waitForFinished() && fonts.waitForFinished());
-        QStringList printed = QString::fromUtf8(text.readAllStandardOutput()).replace(QRegularExpression(u"[ \\t]+"_s), u" "_s)
-                                  .replace(QRegularExpression(u" ?/ ?"_s), u" / "_s).split(u'\f');
+        QStringList printed = QString::fromUtf8(text.readAllStandardOutput()).replace(QRegularExpression(u"[ \\t]+"_s), u" "_s).replace(QRegularExpression(u" ?/ ?"_s), u" / "_s).split(u'\f');
         printed.removeIf([](const QString& page) { return page.trimmed().isEmpty(); });
         QCOMPARE(printed.size(), pages.size());
         for (int i = 0; i < pages.size(); ++i) {

@@ -11,6 +11,7 @@ packages=(
   fonts-liberation2                               # Arial / Times New Roman metrics for the reports
   poppler-utils                                   # pdftotext, pdftoppm: tests read PDFs back
   libcsv-dev                                      # the RFC 4180 parser of the CSV import source
+  clang-format                                    # scripts/check-format.sh
 )
 missing=()
 for p in "${packages[@]}"; do

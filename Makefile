@@ -14,4 +14,4 @@ bench:
 	scripts/bench.sh
 
 clean:
-	rm -rf build
+	rm -rf build build-rel

@@ -18,6 +18,7 @@ struct Figure {
     QString what;
     double seconds = 0;
     double lowerBound = 0;  // 0 when there is none
+    qint64 peakBytes = 0;   // the process's peak resident memory during the run; 0 when not taken
 };
 
 struct Context {
@@ -41,6 +42,22 @@ double timed(F&& f)
     t.start();
     f();
     return double(t.nsecsElapsed()) / 1e9;
+}
+
+// Peak resident memory of the process from startPeakMemory() on. The set-up's
+// freed memory is handed back to the system first, so the figure is the
+// program and its libraries plus what the run holds at its highest.
+void startPeakMemory();
+qint64 peakMemoryBytes();
+
+// A run timed, with its peak memory.
+template <typename F>
+Figure measured(const QString& what, F&& f)
+{
+    startPeakMemory();
+    Figure figure{what, timed(std::forward<F>(f))};
+    figure.peakBytes = peakMemoryBytes();
+    return figure;
 }
 
 }  // namespace quotas::bench

@@ -310,6 +310,7 @@ ImportSummary ProcessarImportacao(int month, int year, int tipo)
     } else {
         Lines lines{source, movements, accounts, connection, quotaColumn,
                     rend1Column, shared().SemSeparadorDecimal, month, year, tipo};
+        LazyCommits lazy(connection);
         while (!source.eof()) {
             ++summary.lines;
             Outcome outcome = Outcome::Rejected;
@@ -326,6 +327,7 @@ ImportSummary ProcessarImportacao(int month, int year, int tipo)
             progress.call("setvalor", {1});
             source.moveNext();
         }
+        lazy.finish();
     }
 
     component.reset();  // the source goes with its component

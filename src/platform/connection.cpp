@@ -8,6 +8,7 @@
 #include <QSqlError>
 #include <QSqlIndex>
 #include <QSqlQuery>
+#include <utility>
 
 namespace quotas {
 
@@ -243,8 +244,35 @@ bool Connection::hasTable(const QString& table)
 
 void Connection::begin()
 {
-    execute(m_depth == 0 ? dialect().beginTransaction() : QStringLiteral("SAVEPOINT sp%1").arg(m_depth));
+    if (m_depth > 0) {
+        execute(QStringLiteral("SAVEPOINT sp%1").arg(m_depth));
+    } else {
+        const QString lazy = m_lazy ? dialect().lazyCommit() : QString();
+        // Both in one round trip: statements without values go as one text.
+        execute(lazy.isEmpty() ? dialect().beginTransaction() : dialect().beginTransaction() + QStringLiteral("; ") + lazy);
+    }
     ++m_depth;
+}
+
+void Connection::flushCommits()
+{
+    const QString mark = dialect().durableMark();
+    if (mark.isEmpty() || m_depth > 0)
+        return;
+    const bool lazy = std::exchange(m_lazy, false);
+    try {
+        begin();
+        scalar(mark);
+        commit();
+    } catch (...) {
+        m_lazy = lazy;
+        try {
+            rollback();
+        } catch (...) {
+        }
+        throw;
+    }
+    m_lazy = lazy;
 }
 
 void Connection::commit()

@@ -84,6 +84,12 @@ public:
     void rollback();
     int transactionDepth() const { return m_depth; }
 
+    // While on, each outermost transaction commits without waiting for the
+    // disk. flushCommits() then commits once durably, which makes every
+    // earlier commit durable too. Prefer the LazyCommits guard.
+    void setLazyCommits(bool on) { m_lazy = on; }
+    void flushCommits();
+
 private:
     void requireOpen() const;
     [[noreturn]] void fail(const QString& what, const QString& sql, const QString& driverText) const;
@@ -95,6 +101,7 @@ private:
     QHash<QString, QSqlQuery*> m_statements;
     QHash<QString, QString> m_primaryKeys;
     int m_depth = 0;
+    bool m_lazy = false;
 };
 
 }  // namespace quotas

@@ -114,6 +114,18 @@ QString Dialect::beginTransaction() const
     return m_engine == Engine::SQLite ? QStringLiteral("BEGIN IMMEDIATE") : QStringLiteral("BEGIN");
 }
 
+QString Dialect::lazyCommit() const
+{
+    // SQLite in WAL mode with synchronous=NORMAL already commits without
+    // waiting for the disk.
+    return m_engine == Engine::SQLite ? QString() : QStringLiteral("SET LOCAL synchronous_commit TO OFF");
+}
+
+QString Dialect::durableMark() const
+{
+    return m_engine == Engine::SQLite ? QString() : QStringLiteral("SELECT txid_current()");
+}
+
 QString Dialect::nullSafeEquals(const QString& column) const
 {
     return m_engine == Engine::SQLite ? column + QStringLiteral(" IS ?")

@@ -25,6 +25,13 @@ public:
     QString translate(const QString& sql) const;
 
     QString beginTransaction() const;
+    // Run right after the start of a transaction whose commit need not wait
+    // for the disk; empty when the engine has no such setting.
+    QString lazyCommit() const;
+    // Run inside a transaction to give it a commit record of its own, so
+    // that its commit waits for the disk and with it every earlier commit;
+    // empty when the engine needs none.
+    QString durableMark() const;
     // "column equals the bound value", Null equal to Null.
     QString nullSafeEquals(const QString& column) const;
     // The new value of a running total: the column plus the bound amount,

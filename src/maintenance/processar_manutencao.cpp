@@ -3,6 +3,7 @@
 #include "component/installation.h"
 #include "component/money.h"
 #include "maintenance/maintenance_panel.h"
+#include "platform/chunked_rows.h"
 #include "platform/components.h"
 #include "platform/connection.h"
 #include "platform/errors.h"
@@ -22,140 +23,123 @@ namespace {
 const char* const kFetching = "Recebendo informação do servidor, aguarde alguns momentos . . .";
 
 struct NullPass {
-    const char* sql;
+    const char* table;
     const char* label;
 };
 
 const NullPass kNullPasses[] = {
-    {"Select * from tbQuotas_Movimentos", "Movimentos Activos"},
-    {"Select * from tbQuotas_Movimentos_Inactivos", "Movimentos Inactivos"},
-    {"Select * from tbQuotas_Movimentos_Historico", "Histórico de Movimentos"},
+    {"tbQuotas_Movimentos", "Movimentos Activos"},
+    {"tbQuotas_Movimentos_Inactivos", "Movimentos Inactivos"},
+    {"tbQuotas_Movimentos_Historico", "Histórico de Movimentos"},
 };
 
 struct TotalsPass {
     const char* accounts;
-    const char* groups;
+    const char* movements;
     const char* label;
 };
 
 const TotalsPass kTotalsPasses[] = {
-    {"Select * from tbQuotas_Socios",
-     "SELECT tbQuotas_Movimentos.socio_id,  Sum(tbQuotas_Movimentos.quota) AS tdebito, "
-     "Sum(tbQuotas_Movimentos.pago) AS tcredito, Count(tbQuotas_Movimentos.quota_id) AS no_docs "
-     "From tbQuotas_Movimentos GROUP BY tbQuotas_Movimentos.socio_id ORDER BY tbQuotas_Movimentos.socio_id",
-     "Acumulados Activos"},
-    {"Select * from tbQuotas_Socios_Inactivos",
-     "SELECT tbQuotas_Movimentos_Inactivos.socio_id,  Sum(tbQuotas_Movimentos_Inactivos.quota) AS tdebito, "
-     "Sum(tbQuotas_Movimentos_Inactivos.pago) AS tcredito, Count(tbQuotas_Movimentos_Inactivos.quota_id) AS no_docs "
-     "From tbQuotas_Movimentos_Inactivos GROUP BY tbQuotas_Movimentos_Inactivos.socio_id "
-     "ORDER BY tbQuotas_Movimentos_Inactivos.socio_id",
-     "Acumulados Inactivos"},
+    {"tbQuotas_Socios", "tbQuotas_Movimentos", "Acumulados Activos"},
+    {"tbQuotas_Socios_Inactivos", "tbQuotas_Movimentos_Inactivos", "Acumulados Inactivos"},
 };
 
-int requireField(const Recordset& rs, const char* name)
+QString keyOf(Connection& connection, const QString& table)
 {
-    const int index = rs.fieldIndex(QString::fromLatin1(name));
-    if (index < 0)
-        throw DbError(QStringLiteral("A coluna \"%1\" não foi encontrada.").arg(QString::fromLatin1(name)));
-    return index;
+    const QString key = connection.primaryKey(table);
+    if (key.isEmpty())
+        throw DbError(QStringLiteral("A tabela \"%1\" não tem chave primária: não é possível gravar.").arg(table));
+    return key;
 }
 
-// Passes 1 to 3. Each repaired row is stored on its own, so a failure keeps
-// the rows repaired before it.
-void repairNulls(Connection& connection, MaintenancePanel& panel, int pass, const NullPass& what, Recordset& work)
+// Passes 1 to 3. The table is read in chunks in the order of its key, so the
+// run holds one chunk whatever the table's size. Each repaired row is saved
+// on its own, so a failure keeps the rows repaired before it; a Null another
+// user filled in meanwhile keeps that user's value.
+void repairNulls(Connection& connection, MaintenancePanel& panel, int pass, const NullPass& what)
 {
-    work.open(QString::fromLatin1(what.sql), connection, Cursor::Static, Lock::Optimistic);
-    if (work.eof()) {
+    const QString table = QString::fromLatin1(what.table);
+    const QString key = keyOf(connection, table);
+    // The rows there are now, as one read of the table would see them: rows
+    // added meanwhile are left to the next run.
+    Recordset extent;
+    extent.open(QStringLiteral("SELECT COUNT(*), MAX(%1) FROM %2").arg(key, table), connection);
+    const int rows = extent.value(0).toInt();
+    const QVariant last = extent.value(1);
+    extent.close();
+    if (rows == 0) {
         panel.startBar(pass, 1);
         panel.stepBar(pass);
-        work.close();
         return;
     }
-    work.moveLast();
-    work.moveFirst();
-    panel.startBar(pass, work.recordCount());
-    const int amounts[] = {requireField(work, "rend1"), requireField(work, "rend2"), requireField(work, "quota"),
-                           requireField(work, "pago")};
-    while (!work.eof()) {
-        bool changed = false;
-        for (const int column : amounts) {
-            if (work.value(column).isNull()) {
-                work.setValue(column, 0.0);
-                changed = true;
-            }
+    panel.startBar(pass, rows);
+    const QString repair = QStringLiteral("UPDATE %1 SET rend1 = COALESCE(rend1, 0), rend2 = COALESCE(rend2, 0), "
+                                          "quota = COALESCE(quota, 0), pago = COALESCE(pago, 0) WHERE %2 = ?")
+                               .arg(table, key);
+    ChunkedRows work(connection,
+                     QStringLiteral("SELECT %1, rend1, rend2, quota, pago FROM %2 WHERE %1 <= ?%3 ORDER BY %1")
+                         .arg(key, table, QStringLiteral("%1")),
+                     key, key, {last});
+    for (; !work.eof(); work.moveNext()) {
+        bool hasNull = false;
+        for (int column = 1; column <= 4; ++column)
+            hasNull = hasNull || work.value(column).isNull();
+        if (hasNull) {
+            Transaction row(connection);
+            connection.execute(repair, {work.value(0)});
+            row.commit();
         }
-        if (changed)
-            work.update();
-        work.moveNext();
         panel.stepBar(pass);
     }
-    work.close();
 }
 
 // Passes 4 and 5: the reset and the rebuild of one account table commit
 // together, so that a failure half-way leaves the totals as they were rather
-// than at 0, which would show every member as paid up.
+// than at 0, which would show every member as paid up. The grouped sums are
+// read in chunks in the order of socio_id; each goes to the member's first
+// account, or to a new one when he has none.
 void rebuildTotals(Connection& connection, MaintenancePanel& panel, int pass, const TotalsPass& what, QObject* progress,
-                   bool& progressShown, Recordset& work, Recordset& target)
+                   bool& progressShown)
 {
     callByName(progress, "Iniciar", {2, QString::fromUtf8(kFetching), panel.caption()});
     progressShown = true;
-    Transaction tx(connection);
     const QString accounts = QString::fromLatin1(what.accounts);
-    work.open(accounts, connection, Cursor::Static, Lock::Optimistic);
-    {
-        const int quotas = requireField(work, "total_quotas");
-        const int pago = requireField(work, "total_pago");
-        while (!work.eof()) {
-            work.setValue(quotas, 0.0);
-            work.setValue(pago, 0.0);
-            work.update();
-            work.moveNext();
-            panel.keepAlive();
-        }
-    }
-    work.close();
-
-    target.open(accounts, connection, Cursor::Static, Lock::Optimistic);
-    work.open(QString::fromLatin1(what.groups), connection, Cursor::Static, Lock::Optimistic);
+    const QString movements = QString::fromLatin1(what.movements);
+    const QString key = keyOf(connection, accounts);
+    Transaction tx(connection);
+    connection.execute(QStringLiteral("UPDATE %1 SET total_quotas = 0, total_pago = 0").arg(accounts));
+    const int members =
+        connection.scalar(QStringLiteral("SELECT COUNT(DISTINCT socio_id) FROM %1").arg(movements)).toInt();
+    ChunkedRows groups(connection,
+                       QStringLiteral("SELECT socio_id, SUM(quota) AS tdebito, SUM(pago) AS tcredito, COUNT(quota_id) AS "
+                                      "no_docs FROM %1 WHERE socio_id IS NOT NULL%2 GROUP BY socio_id ORDER BY socio_id")
+                           .arg(movements, QStringLiteral("%1")),
+                       QStringLiteral("socio_id"), QStringLiteral("socio_id"));
     callByName(progress, "setvalor", {2});
     callByName(progress, "terminar");
     progressShown = false;
 
-    if (work.eof()) {
+    if (groups.eof()) {
         panel.startBar(pass, 1);
         panel.stepBar(pass);
     } else {
-        work.moveLast();
-        work.moveFirst();
-        panel.startBar(pass, work.recordCount());
-        const QString socioId = QStringLiteral("socio_id");
-        const int groupSocio = requireField(work, "socio_id");
-        const int debit = requireField(work, "tdebito");
-        const int credit = requireField(work, "tcredito");
-        const int accountSocio = requireField(target, "socio_id");
-        const int totalQuotas = requireField(target, "total_quotas");
-        const int totalPago = requireField(target, "total_pago");
-        while (!work.eof()) {
-            const QVariant socio = work.value(groupSocio);
-            // The search goes through the set's index on socio_id, built on
-            // the first search of the pass: O(1) per member.
-            target.moveFirst();
-            target.find(socioId, socio);
-            if (target.eof()) {
-                target.addNew();
-                target.setValue(accountSocio, socio);
-            }
+        panel.startBar(pass, members);
+        const QString toFirstAccount =
+            QStringLiteral("UPDATE %1 SET total_quotas = ?, total_pago = ? WHERE %2 = (SELECT MIN(%2) FROM %1 WHERE "
+                           "socio_id = ?)")
+                .arg(accounts, key);
+        const QString newAccount =
+            QStringLiteral("INSERT INTO %1 (socio_id, total_quotas, total_pago) VALUES (?, ?, ?)").arg(accounts);
+        for (; !groups.eof(); groups.moveNext()) {
+            const QVariant socio = groups.value(0);
             // SQLite adds REALs in binary: the sums carry stray fractions of a cent.
-            target.setValue(totalQuotas, roundCents(work.value(debit).toDouble()));
-            target.setValue(totalPago, roundCents(work.value(credit).toDouble()));
-            target.update();
-            work.moveNext();
+            const double quotas = roundCents(groups.value(1).toDouble());
+            const double pago = roundCents(groups.value(2).toDouble());
+            if (connection.execute(toFirstAccount, {quotas, pago, socio}) == 0)
+                connection.execute(newAccount, {socio, quotas, pago});
             panel.stepBar(pass);
         }
     }
-    work.close();
-    target.close();
     tx.commit();
 }
 
@@ -170,8 +154,6 @@ QString reasonOf(const std::exception& e)
 
 void ProcessarManutencao(Connection& connection, MaintenancePanel& panel)
 {
-    Recordset work;
-    Recordset target;
     std::unique_ptr<QObject> progress;
     try {
         progress = createComponent(QStringLiteral("Velumo.General"));
@@ -201,17 +183,19 @@ void ProcessarManutencao(Connection& connection, MaintenancePanel& panel)
         return QuotasError(text + QStringLiteral(" Pode iniciar a manutenção de novo."));
     };
     try {
+        LazyCommits lazy(connection);
         panel.playAnimation(QDir(installationDataDir()).filePath(QStringLiteral("filemove.avi")));
         int pass = 1;
         for (const NullPass& what : kNullPasses) {
             stage = QString::fromUtf8(what.label);
-            repairNulls(connection, panel, pass++, what, work);
+            repairNulls(connection, panel, pass++, what);
         }
         totals = true;
         for (const TotalsPass& what : kTotalsPasses) {
             stage = QString::fromUtf8(what.label);
-            rebuildTotals(connection, panel, pass++, what, progress.get(), progressShown, work, target);
+            rebuildTotals(connection, panel, pass++, what, progress.get(), progressShown);
         }
+        lazy.finish();
     } catch (const std::exception& e) {
         throw stop(reasonOf(e));
     } catch (...) {

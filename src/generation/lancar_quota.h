@@ -19,7 +19,7 @@ struct PostingContext {
     int ano = 0;
     int mes = 0;
     QDate today;
-    Recordset& member;     // current row: no, no_tap, empresa, seguro, seguro_data_rescisao
+    const Recordset& member;  // current row: no, no_tap, empresa, seguro, seguro_data_rescisao
     DuesAccount& account;  // the member's account, locked for this transaction
     Recordset& employers;  // tbEmpresas, searched by code
     DuesCounter& counter;

@@ -4,7 +4,9 @@
 #include "component/shared_objects.h"
 #include "generation/dues_account.h"
 #include "generation/dues_counter.h"
+#include "generation/due_rules.h"
 #include "generation/lancar_quota.h"
+#include "platform/chunked_rows.h"
 #include "platform/components.h"
 #include "platform/connection.h"
 #include "platform/errors.h"
@@ -16,10 +18,18 @@ namespace quotas {
 
 namespace {
 
+// A member's row says whether he has an account and which dues of the
+// month he already has, so that a month run again skips the members it
+// charged without a transaction each. A due missing here is checked again
+// under the account's lock before it is posted.
 const QString kMembersSql = QStringLiteral(
-    "SELECT tbsocios.socio_id as no, tbsocios.no_tap, tbsocios.fuv, tbsocios.empresa, tbsocios.seguro_data_rescisao, "
-    "tbsocios.seguro, tbquotas_socios.* FROM tbsocios LEFT OUTER JOIN tbquotas_socios ON tbsocios.socio_id = "
-    "tbquotas_socios.socio_id");
+    "SELECT s.socio_id AS no, s.no_tap, s.fuv, s.empresa, s.seguro_data_rescisao, s.seguro, "
+    "(SELECT MIN(a.squota_id) FROM tbquotas_socios a WHERE a.socio_id = s.socio_id) AS squota_id, "
+    "(SELECT COUNT(*) FROM tbQuotas_Movimentos m WHERE m.socio_id = s.socio_id AND m.ano = ? AND m.mes = ? "
+    "AND m.tipo = 1) AS sindicato, "
+    "(SELECT COUNT(*) FROM tbQuotas_Movimentos m WHERE m.socio_id = s.socio_id AND m.ano = ? AND m.mes = ? "
+    "AND m.tipo = 2) AS seguro_lancado "
+    "FROM tbsocios s WHERE s.socio_id <= ?%1 ORDER BY s.socio_id");
 const QString kNewAccountSql = QStringLiteral(
     "INSERT INTO tbQuotas_Socios (socio_id, ult_ano, ult_mes, ult_rend1, ult_rend2, ult_quota_sindicato, "
     "ult_quota_seguro, total_quotas, total_pago) VALUES (?,?,?,?,0,0,0,0,0) ON CONFLICT (socio_id) DO NOTHING");
@@ -60,8 +70,12 @@ public:
     }
 
     // One member, all or nothing.
-    void visit(Recordset& member)
+    void visit(const Recordset& member)
     {
+        if (fullyCharged(member)) {
+            ++m_outcome.members;
+            return;
+        }
         Transaction tx(m_connection);
         const QVariant no = member.value(QStringLiteral("no"));
         if (member.isNull(QStringLiteral("squota_id")))
@@ -84,7 +98,15 @@ public:
     GenerationOutcome& outcome() { return m_outcome; }
 
 private:
-    void createAccount(Recordset& member)
+    bool fullyCharged(const Recordset& member) const
+    {
+        return !member.isNull(QStringLiteral("squota_id")) && member.value(QStringLiteral("sindicato")).toInt() > 0
+               && (member.value(QStringLiteral("seguro_lancado")).toInt() > 0
+                   || !insuranceCharged(member.value(QStringLiteral("seguro")),
+                                        member.value(QStringLiteral("seguro_data_rescisao")), m_ano, m_mes));
+    }
+
+    void createAccount(const Recordset& member)
     {
         QVariant rend1 = kUnknownCategoryRend1;
         m_categories.moveFirst();
@@ -120,13 +142,19 @@ GenerationOutcome ProcessarQuotas(Connection& connection, int ano, int mes, int 
     if (ano < 1900 || ano > 9999)
         throw QuotasError(QStringLiteral("O ano de processamento (%1) não é válido.").arg(ano));
 
-    Recordset members;
-    if (socio == 0)
-        members.open(kMembersSql + QStringLiteral(" ORDER BY tbsocios.socio_id"), connection, Cursor::Keyset,
-                     Lock::ReadOnly);
-    else
-        members.open(kMembersSql + QStringLiteral(" WHERE tbsocios.socio_id = ? ORDER BY tbsocios.socio_id"),
-                     connection, Cursor::Keyset, Lock::ReadOnly, {socio});
+    // The members there are now, as one read of the table would see them,
+    // read a chunk at a time: a member added meanwhile waits for the next run.
+    Recordset extent;
+    extent.open(socio == 0 ? QStringLiteral("SELECT COUNT(*), MAX(socio_id) FROM tbsocios")
+                           : QStringLiteral("SELECT COUNT(*), MAX(socio_id) FROM tbsocios WHERE socio_id = ?"),
+                connection, Cursor::Unspecified, Lock::ReadOnly, socio == 0 ? QVariantList{} : QVariantList{socio});
+    const int count = extent.value(0).toInt();
+    const QVariant last = count > 0 ? extent.value(1) : QVariant(0);
+    extent.close();
+    ChunkedRows members(connection,
+                        kMembersSql.arg(socio == 0 ? QStringLiteral("%1") : QStringLiteral(" AND s.socio_id >= ?%1")),
+                        QStringLiteral("s.socio_id"), QStringLiteral("no"),
+                        socio == 0 ? QVariantList{ano, mes, ano, mes, last} : QVariantList{ano, mes, ano, mes, last, socio});
     Run run(connection, ano, mes, today);
     run.openLookups();
 
@@ -135,20 +163,22 @@ GenerationOutcome ProcessarQuotas(Connection& connection, int ano, int mes, int 
     QObject* progress = objects.progress.get();
     ProgressGuard closing(progress);
     callByName(progress, "Iniciar",
-               {members.recordCount(), QStringLiteral("Criando registos de quotas, aguarde alguns momentos . . ."),
+               {count, QStringLiteral("Criando registos de quotas, aguarde alguns momentos . . ."),
                 QStringLiteral("Processamento de Quotas")});
 
+    LazyCommits lazy(connection);
     for (; !members.eof(); members.moveNext()) {
         try {
-            run.visit(members);
+            run.visit(members.row());
         } catch (const QuotasError& e) {
             throw QuotasError(QStringLiteral("O processamento de quotas parou no associado com o Nº Empresa %1: %2\n"
                                              "As quotas dos associados anteriores ficaram gravadas; as deste associado "
                                              "não. Volte a gerar o mesmo mês para completar.")
-                                  .arg(memberLabel(members), e.message()));
+                                  .arg(memberLabel(members.row()), e.message()));
         }
         callByName(progress, "setvalor", {1});
     }
+    lazy.finish();
     return run.outcome();
 }
 

@@ -84,11 +84,8 @@ void repairNulls(Connection& connection, MaintenancePanel& panel, int pass, cons
         bool hasNull = false;
         for (int column = 1; column <= 4; ++column)
             hasNull = hasNull || work.value(column).isNull();
-        if (hasNull) {
-            Transaction row(connection);
+        if (hasNull)
             connection.execute(repair, {work.value(0)});
-            row.commit();
-        }
         panel.stepBar(pass);
     }
 }

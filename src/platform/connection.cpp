@@ -2,13 +2,13 @@
 
 #include "platform/connection_string.h"
 #include "platform/errors.h"
+#include "platform/transaction.h"
 
 #include <QAtomicInt>
 #include <QFileInfo>
 #include <QSqlError>
 #include <QSqlIndex>
 #include <QSqlQuery>
-#include <utility>
 
 namespace quotas {
 
@@ -244,14 +244,15 @@ bool Connection::hasTable(const QString& table)
 
 void Connection::begin()
 {
-    if (m_depth > 0) {
-        execute(QStringLiteral("SAVEPOINT sp%1").arg(m_depth));
-    } else {
-        const QString lazy = m_lazy ? dialect().lazyCommit() : QString();
-        // Both in one round trip: statements without values go as one text.
-        execute(lazy.isEmpty() ? dialect().beginTransaction() : dialect().beginTransaction() + QStringLiteral("; ") + lazy);
-    }
+    execute(m_depth == 0 ? dialect().beginTransaction() : QStringLiteral("SAVEPOINT sp%1").arg(m_depth));
     ++m_depth;
+}
+
+void Connection::setLazyCommits(bool on)
+{
+    const QString setting = dialect().lazyCommits(on);
+    if (!setting.isEmpty())
+        execute(setting);
 }
 
 void Connection::flushCommits()
@@ -259,20 +260,9 @@ void Connection::flushCommits()
     const QString mark = dialect().durableMark();
     if (mark.isEmpty() || m_depth > 0)
         return;
-    const bool lazy = std::exchange(m_lazy, false);
-    try {
-        begin();
-        scalar(mark);
-        commit();
-    } catch (...) {
-        m_lazy = lazy;
-        try {
-            rollback();
-        } catch (...) {
-        }
-        throw;
-    }
-    m_lazy = lazy;
+    Transaction durable(*this);
+    scalar(mark);
+    durable.commit();
 }
 
 void Connection::commit()

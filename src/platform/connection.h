@@ -84,10 +84,11 @@ public:
     void rollback();
     int transactionDepth() const { return m_depth; }
 
-    // While on, each outermost transaction commits without waiting for the
-    // disk. flushCommits() then commits once durably, which makes every
-    // earlier commit durable too. Prefer the LazyCommits guard.
-    void setLazyCommits(bool on) { m_lazy = on; }
+    // While on, the session's commits, of transactions and of single
+    // statements alike, do not wait for the disk. flushCommits() commits once
+    // durably, which makes every earlier commit durable too. Call both
+    // outside a transaction; prefer the LazyCommits guard.
+    void setLazyCommits(bool on);
     void flushCommits();
 
 private:
@@ -101,7 +102,6 @@ private:
     QHash<QString, QSqlQuery*> m_statements;
     QHash<QString, QString> m_primaryKeys;
     int m_depth = 0;
-    bool m_lazy = false;
 };
 
 }  // namespace quotas

@@ -114,11 +114,13 @@ QString Dialect::beginTransaction() const
     return m_engine == Engine::SQLite ? QStringLiteral("BEGIN IMMEDIATE") : QStringLiteral("BEGIN");
 }
 
-QString Dialect::lazyCommit() const
+QString Dialect::lazyCommits(bool on) const
 {
     // SQLite in WAL mode with synchronous=NORMAL already commits without
     // waiting for the disk.
-    return m_engine == Engine::SQLite ? QString() : QStringLiteral("SET LOCAL synchronous_commit TO OFF");
+    if (m_engine == Engine::SQLite)
+        return QString();
+    return on ? QStringLiteral("SET synchronous_commit TO OFF") : QStringLiteral("RESET synchronous_commit");
 }
 
 QString Dialect::durableMark() const

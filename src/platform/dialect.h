@@ -25,9 +25,9 @@ public:
     QString translate(const QString& sql) const;
 
     QString beginTransaction() const;
-    // Run right after the start of a transaction whose commit need not wait
-    // for the disk; empty when the engine has no such setting.
-    QString lazyCommit() const;
+    // Turns on or off, for the session, commits that do not wait for the
+    // disk; empty when the engine has no such setting.
+    QString lazyCommits(bool on) const;
     // Run inside a transaction to give it a commit record of its own, so
     // that its commit waits for the disk and with it every earlier commit;
     // empty when the engine needs none.

@@ -34,24 +34,24 @@ private:
     bool m_done = false;
 };
 
-// For the length of a run: each of its transactions commits without waiting
-// for the disk, and finish() ends the run with one commit that does wait,
-// which makes every earlier one durable as well. A crash during the run loses
-// at most its last moments, which running it again completes, and every
-// member's or line's writes still commit or vanish together.
+// For the length of a run: its commits do not wait for the disk, and
+// finish() ends the run with one commit that does wait, which makes every
+// earlier one durable as well. A crash during the run loses at most its last
+// moments, which running it again completes, and every member's or line's
+// writes still commit or vanish together. Outside a transaction only.
 class LazyCommits {
 public:
     explicit LazyCommits(Connection& connection) : m_connection(connection) { m_connection.setLazyCommits(true); }
     ~LazyCommits()
     {
-        m_connection.setLazyCommits(false);
-        if (!m_done) {
-            try {
-                // A run that stopped keeps what it saved before the stop.
-                m_connection.flushCommits();
-            } catch (...) {
-                // The failure that stopped the run is the one worth reporting.
-            }
+        if (m_done)
+            return;
+        try {
+            m_connection.setLazyCommits(false);
+            // A run that stopped keeps what it saved before the stop.
+            m_connection.flushCommits();
+        } catch (...) {
+            // The failure that stopped the run is the one worth reporting.
         }
     }
     LazyCommits(const LazyCommits&) = delete;

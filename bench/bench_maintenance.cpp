@@ -130,8 +130,7 @@ QString outcome(Connection& c)
     if (got != want)
         throw QuotasError(QStringLiteral("the run and the set-based bound disagree: %1 / %2").arg(got, want));
     run.lowerBound = repairs + totals;
-    return QList<Figure>{run, {QStringLiteral(" passes 1-3"), panel.repairsDone, repairs},
-                         {QStringLiteral(" passes 4-5"), run.seconds - panel.repairsDone, totals}};
+    return QList<Figure>{run, {QStringLiteral(" passes 1-3"), panel.repairsDone, repairs}, {QStringLiteral(" passes 4-5"), run.seconds - panel.repairsDone, totals}};
 });
 
 }  // namespace

@@ -20,8 +20,8 @@ struct PostingContext {
     int mes = 0;
     QDate today;
     const Recordset& member;  // current row: no, no_tap, empresa, seguro, seguro_data_rescisao
-    DuesAccount& account;  // the member's account, locked for this transaction
-    Recordset& employers;  // tbEmpresas, searched by code
+    DuesAccount& account;     // the member's account, locked for this transaction
+    Recordset& employers;     // tbEmpresas, searched by code
     DuesCounter& counter;
     GenerationOutcome& outcome;
     // The types the member is already charged with for the month, read

@@ -25,6 +25,7 @@ const char* const kUsage =
     "  init-db [--demo N]\n"
     "  login [--print-connection-string]\n"
     "  gerar --ano A --mes M [--no-tap N]\n"
+    "  anular-geracao --ano A --mes M [--tipo 1|2] [--no-tap N] [--confirmar]\n"
     "  importar --ano A --mes M --tipo 1|2 [--sem-separador] [--pdf SAIDA] FICHEIRO\n"
     "  manutencao\n"
     "  listagem --pdf SAIDA | cartas --pdf SAIDA | rejeitados --pdf SAIDA\n";
@@ -53,6 +54,7 @@ int dispatch(QStringList args)
         {QStringLiteral("init-db"), initDb},
         {QStringLiteral("login"), login},
         {QStringLiteral("gerar"), gerar},
+        {QStringLiteral("anular-geracao"), anularGeracao},
         {QStringLiteral("importar"), importar},
         {QStringLiteral("manutencao"), manutencao},
         {QStringLiteral("listagem"), listagem},

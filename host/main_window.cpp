@@ -29,6 +29,7 @@ QString captionOf(const QByteArray& method)
         {"CartasDividas", QStringLiteral("&Cartas de Dívidas")},
         {"ImportarQuotas", QStringLiteral("&Importar Quotas")},
         {"GerarQuotas", QStringLiteral("&Gerar Quotas")},
+        {"AnularGeracao", QStringLiteral("&Anular Geração")},
         {"Login", QStringLiteral("Ligar à &Base de Dados")},
         {"Registo", QStringLiteral("&Registo de Quota")},
     };

@@ -45,6 +45,11 @@ void General::GerarQuotas()
     showGenerationDialog();
 }
 
+void General::AnularGeracao()
+{
+    showUndoDialog();
+}
+
 bool General::Login(const QVariant&, const QVariant&, const QVariant&)
 {
     DataEnvironment& data = Data();

@@ -27,6 +27,8 @@ public:
     Q_INVOKABLE void ImportarQuotas();
     // The dues generation dialog, modal.
     Q_INVOKABLE void GerarQuotas();
+    // The dialog that takes back a month's generated dues, modal.
+    Q_INVOKABLE void AnularGeracao();
     // Reads the connection settings and opens both connections. False when a
     // setting is missing (no connection touched); the arguments are not used.
     Q_INVOKABLE bool Login(const QVariant& temp1 = QVariant(), const QVariant& temp2 = QVariant(),

@@ -1,6 +1,7 @@
 #include "generation/entry.h"
 
 #include "component/shared_objects.h"
+#include "generation/frm_anular_geracao.h"
 #include "generation/frm_gerar_quotas.h"
 
 namespace quotas {
@@ -15,6 +16,12 @@ void showGenerationDialog()
     dialog->exec();
     // Closed by either button: unloaded, so the next showing starts afresh.
     delete dialog;
+}
+
+void showUndoDialog()
+{
+    frmAnularGeracao dialog;
+    dialog.exec();
 }
 
 }  // namespace quotas

@@ -12,11 +12,13 @@ enum class Icon {
     Exclamation,
     Information
 };
+// YesNoDefaultNo asks before something that cannot be taken back: Enter answers No.
 enum class Buttons {
     Ok,
     OkCancel,
     YesNo,
-    YesNoCancel
+    YesNoCancel,
+    YesNoDefaultNo
 };
 enum class Answer {
     Ok,

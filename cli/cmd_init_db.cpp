@@ -29,6 +29,8 @@ int initDb(const QStringList& args)
         QDir().mkpath(QFileInfo(target.file).absolutePath());
     connection.open(Connection::OpenMode::CreateIfMissing);
     const QStringList created = createSchema(connection);
+    // Members the host numbered itself must not meet the demo's.
+    moveSequencesPastKeys(connection);
     QString report = created.isEmpty() ? QStringLiteral("A base de dados já tinha todas as tabelas.\n")
                                        : QStringLiteral("Tabelas criadas: %1.\n").arg(created.join(QStringLiteral(", ")));
     if (demo > 0)

@@ -18,6 +18,7 @@ int initDb(const QStringList& args);
 int login(const QStringList& args);
 int gerar(const QStringList& args);
 int anularGeracao(const QStringList& args);
+int copiar(const QStringList& args);
 int importar(const QStringList& args);
 int manutencao(const QStringList& args);
 int listagem(const QStringList& args);

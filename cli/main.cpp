@@ -28,6 +28,7 @@ const char* const kUsage =
     "  anular-geracao --ano A --mes M [--tipo 1|2] [--no-tap N] [--confirmar]\n"
     "  importar --ano A --mes M --tipo 1|2 [--sem-separador] [--pdf SAIDA] FICHEIRO\n"
     "  manutencao\n"
+    "  copiar --data-source HOST[,PORTA] --catalog BD --user U --password P\n"
     "  listagem --pdf SAIDA | cartas --pdf SAIDA | rejeitados --pdf SAIDA\n";
 
 void printError(const QString& text)
@@ -55,6 +56,7 @@ int dispatch(QStringList args)
         {QStringLiteral("login"), login},
         {QStringLiteral("gerar"), gerar},
         {QStringLiteral("anular-geracao"), anularGeracao},
+        {QStringLiteral("copiar"), copiar},
         {QStringLiteral("importar"), importar},
         {QStringLiteral("manutencao"), manutencao},
         {QStringLiteral("listagem"), listagem},

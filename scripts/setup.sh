@@ -12,6 +12,7 @@ packages=(
   poppler-utils                                   # pdftotext, pdftoppm: tests read PDFs back
   libcsv-dev                                      # the RFC 4180 parser of the CSV import source
   clang-format                                    # scripts/check-format.sh
+  libpq-dev                                       # libpq's header: COPY when copying to a server
 )
 missing=()
 for p in "${packages[@]}"; do

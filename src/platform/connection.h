@@ -7,6 +7,7 @@
 #include <QString>
 #include <QStringList>
 #include <QVariantList>
+#include <functional>
 #include <memory>
 #include <optional>
 
@@ -72,6 +73,12 @@ public:
     // per connection when there are params); the caller reads the query and
     // calls finish() before running anything else. Throws DbError.
     QSqlQuery& run(const QString& translatedSql, const QVariantList& params);
+
+    // Appends rows to a table: COPY on PostgreSQL, multi-row INSERTs on
+    // SQLite, inside the caller's transaction. next() fills one row's values
+    // in the order of columns and returns false after the last. Returns the
+    // number of rows written.
+    qint64 appendRows(const QString& table, const QStringList& columns, const std::function<bool(QVariantList&)>& next);
 
     // Name of the primary-key column of a table ("" when it has none).
     QString primaryKey(const QString& table);

@@ -2,6 +2,7 @@
 
 #include "component/month_names.h"
 #include "platform/connection.h"
+#include "platform/errors.h"
 #include "platform/transaction.h"
 
 namespace quotas {
@@ -126,6 +127,44 @@ QStringList schemaTables()
     for (const TableDef& t : tables())
         names << t.name;
     return names;
+}
+
+TableColumns tableColumns(const QString& name)
+{
+    TableColumns out;
+    for (const TableDef& table : tables()) {
+        if (table.name.compare(name, Qt::CaseInsensitive) != 0)
+            continue;
+        for (const ColumnDef& c : table.columns) {
+            const QString column = QString::fromLatin1(c.name);
+            out.all << column;
+            if (c.kind == Kind::Money || c.kind == Kind::Total)
+                out.money << column;
+            if (c.kind == Kind::Key)
+                out.identity = column;
+        }
+    }
+    return out;
+}
+
+void moveSequencesPastKeys(Connection& connection)
+{
+    if (connection.engine() != Engine::PostgreSQL)
+        return;
+    for (const TableDef& table : tables()) {
+        const QString key = tableColumns(table.name).identity;
+        if (key.isEmpty() || !connection.hasTable(table.name))
+            continue;
+        // An empty table starts again at 1; otherwise the next key is the
+        // highest plus one. A host's table whose key is not ours is left alone.
+        try {
+            connection.execute(QStringLiteral("SELECT setval(pg_get_serial_sequence(?, ?), COALESCE(MAX(%1), 0) + 1, false) "
+                                              "FROM %2")
+                                   .arg(key, table.name),
+                               {table.name.toLower(), key});
+        } catch (const DbError&) {
+        }
+    }
 }
 
 QStringList createSchema(Connection& connection)

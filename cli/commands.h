@@ -24,6 +24,8 @@ int manutencao(const QStringList& args);
 int listagem(const QStringList& args);
 int cartas(const QStringList& args);
 int rejeitados(const QStringList& args);
+int extrato(const QStringList& args);
+int resumo(const QStringList& args);
 
 // Runs Login on the shared data environment; a missing setting is a
 // UsageError naming it.

@@ -29,7 +29,9 @@ const char* const kUsage =
     "  importar --ano A --mes M --tipo 1|2 [--sem-separador] [--pdf SAIDA] FICHEIRO\n"
     "  manutencao\n"
     "  copiar --data-source HOST[,PORTA] --catalog BD --user U --password P\n"
-    "  listagem --pdf SAIDA | cartas --pdf SAIDA | rejeitados --pdf SAIDA\n";
+    "  listagem --pdf SAIDA | cartas --pdf SAIDA | rejeitados --pdf SAIDA\n"
+    "  extrato --no-tap N [--desde AAAA-MM] [--ate AAAA-MM] [--todos-os-movimentos] --pdf SAIDA\n"
+    "  resumo --ano A --mes M [--pdf SAIDA] [--csv SAIDA]\n";
 
 void printError(const QString& text)
 {
@@ -62,6 +64,8 @@ int dispatch(QStringList args)
         {QStringLiteral("listagem"), listagem},
         {QStringLiteral("cartas"), cartas},
         {QStringLiteral("rejeitados"), rejeitados},
+        {QStringLiteral("extrato"), extrato},
+        {QStringLiteral("resumo"), resumo},
     };
     const auto command = commands.find(args.front());
     if (command == commands.end()) {

@@ -32,6 +32,8 @@ QString captionOf(const QByteArray& method)
         {"AnularGeracao", QStringLiteral("&Anular Geração")},
         {"Login", QStringLiteral("Ligar à &Base de Dados")},
         {"Registo", QStringLiteral("&Registo de Quota")},
+        {"ExtratoQuotas", QStringLiteral("&Extrato de Quotas")},
+        {"ResumoMes", QStringLiteral("Res&umo do Mês")},
     };
     return captions.value(method, QString::fromLatin1(method));
 }
@@ -146,6 +148,12 @@ void MainWindow::call(const QByteArray& method)
     try {
         if (method == "Registo")
             openRecord();
+        else if (method == "ExtratoQuotas") {
+            if (currentMember().isValid())
+                m_general.ExtratoQuotas(currentMember());
+            else
+                quotas::msgBox(QStringLiteral("Escolha um associado."), quotas::Buttons::Ok, quotas::Icon::Information);
+        }
         else if (method == "Login") {
             if (!m_general.Login())
                 quotas::msgBox(QStringLiteral("A configuração da base de dados está incompleta."), quotas::Buttons::Ok,

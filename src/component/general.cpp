@@ -68,4 +68,18 @@ void General::Registo(QObject*, const QVariant& Pkey, const QString&, const QStr
     showRecordWindow(*this, rs, Pkey, Caller);
 }
 
+void General::ExtratoQuotas(const QVariant& socio)
+{
+    if (!socio.isValid() || socio.isNull())
+        return;
+    StatementRequest request;
+    request.socioId = socio;
+    showMemberStatement(request);
+}
+
+void General::ResumoMes()
+{
+    showMonthSummaryDialog();
+}
+
 }  // namespace quotas

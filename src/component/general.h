@@ -39,6 +39,15 @@ public:
     // Rs and Tabela are not used.
     Q_INVOKABLE void Registo(QObject* Rs = nullptr, const QVariant& Pkey = QVariant(), const QString& Tabela = QString(),
                              const QString& StrWhere = QString(), QObject* Caller = nullptr);
+
+    // Beyond the host's original seven, which keep their places above.
+
+    // The dues statement of member socio (socio_id), every active movement,
+    // in a modal print preview. Nothing happens for an empty socio.
+    Q_INVOKABLE void ExtratoQuotas(const QVariant& socio = QVariant());
+    // The month's reconciliation summary: the dialog that chooses the year
+    // and month and previews it, modal.
+    Q_INVOKABLE void ResumoMes();
 };
 
 }  // namespace quotas

@@ -40,16 +40,24 @@ void Report::setObserver(std::function<void(const ReportDocument&)> o)
 
 ReportDocument Report::run(const QDate& printed)
 {
-    Recordset& rows = Data().command(m_layout->command).execute();
-    ReportDocument doc = layOutReport(m_layout, rows, printed);
+    return layOutObservedReport(m_layout, Data().command(m_layout->command).execute(), printed);
+}
+
+void Report::showPreview(QWidget* parent)
+{
+    showReportPreview(run(), parent);
+}
+
+ReportDocument layOutObservedReport(std::shared_ptr<const ReportLayout> layout, Recordset& rows, const QDate& printed)
+{
+    ReportDocument doc = layOutReport(std::move(layout), rows, printed);
     if (observer())
         observer()(doc);
     return doc;
 }
 
-void Report::showPreview(QWidget* parent)
+void showReportPreview(const ReportDocument& doc, QWidget* parent)
 {
-    const ReportDocument doc = run();
     QPrinter printer(QPrinter::HighResolution);
     setUpReportPrinter(printer, doc);
     if (!parent)
@@ -64,7 +72,7 @@ void Report::showPreview(QWidget* parent)
     // An error inside the paint request cannot cross Qt's signal; it is kept
     // and raised once the dialog is closed.
     QString failure;
-    connect(&dialog, &QPrintPreviewDialog::paintRequested, &dialog, [&](QPrinter* target) {
+    QObject::connect(&dialog, &QPrintPreviewDialog::paintRequested, &dialog, [&](QPrinter* target) {
         try {
             paintReport(doc, *target, target->pageRanges());
         } catch (const QuotasError& e) {

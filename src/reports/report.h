@@ -13,6 +13,8 @@ class QWidget;
 
 namespace quotas {
 
+class Recordset;
+
 // A report bound to a named command of Data (prtListagemDividas,
 // prtCartasDividas, prtExtra): it runs the command when the command's result
 // set is not open, lays the rows out and shows, prints or writes the pages.
@@ -42,6 +44,14 @@ public:
 private:
     std::shared_ptr<const ReportLayout> m_layout;
 };
+
+// Lays pages out as Report::run does, telling the observer, for reports
+// whose rows are computed rather than read from a named command.
+ReportDocument layOutObservedReport(std::shared_ptr<const ReportLayout> layout, Recordset& rows,
+                                    const QDate& printed = QDate::currentDate());
+
+// The modal print preview of pages already laid out.
+void showReportPreview(const ReportDocument& doc, QWidget* parent = nullptr);
 
 // The report held in one of the shared slots (prtListagemDividas ...), created
 // with its layout on first use.

@@ -31,7 +31,7 @@ private slots:
                 names << name;
         }
         QCOMPARE(names, QStringList({"CallManutencaoDados", "ListagemDividas", "CartasDividas", "ImportarQuotas",
-                                     "GerarQuotas", "AnularGeracao", "Login", "Registo"}));
+                                     "GerarQuotas", "AnularGeracao", "Login", "Registo", "ExtratoQuotas", "ResumoMes"}));
     }
 
     void registoWithoutAKeyOrRowsShowsNothing()

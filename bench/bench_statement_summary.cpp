@@ -44,8 +44,7 @@ void addHistory(Connection& c, const QVariant& socio)
             const int tipo = month % 2 + 1;
             c.execute(QStringLiteral("INSERT INTO tbQuotas_Movimentos (data, ano, mes, socio_id, ref, rend1, rend2, quota, "
                                      "pago, tipo, quota_no) VALUES (?, ?, ?, ?, ?, 1000, 0, 15, ?, ?, ?)"),
-                      {QDate(year, month, 1), year, month, socio, tipo == 1 ? QStringLiteral("Sindicato")
-                                                                             : QStringLiteral("Seguro"),
+                      {QDate(year, month, 1), year, month, socio, tipo == 1 ? QStringLiteral("Sindicato") : QStringLiteral("Seguro"),
                        month % 3 ? 15.0 : 0.0, tipo, ++number});
         }
     }

@@ -153,8 +153,7 @@ void MainWindow::call(const QByteArray& method)
                 m_general.ExtratoQuotas(currentMember());
             else
                 quotas::msgBox(QStringLiteral("Escolha um associado."), quotas::Buttons::Ok, quotas::Icon::Information);
-        }
-        else if (method == "Login") {
+        } else if (method == "Login") {
             if (!m_general.Login())
                 quotas::msgBox(QStringLiteral("A configuração da base de dados está incompleta."), quotas::Buttons::Ok,
                                quotas::Icon::Exclamation);

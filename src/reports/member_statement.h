@@ -16,9 +16,9 @@ class Connection;
 // Which movements of one member a statement covers.
 struct StatementRequest {
     QVariant socioId;
-    int fromPeriod = 0;          // year * 100 + month; 0 from the first movement
-    int toPeriod = 0;            // likewise; 0 up to the last
-    bool allMovements = false;   // the inactive and history movements too
+    int fromPeriod = 0;         // year * 100 + month; 0 from the first movement
+    int toPeriod = 0;           // likewise; 0 up to the last
+    bool allMovements = false;  // the inactive and history movements too
 };
 
 struct StatementLine {
@@ -31,8 +31,8 @@ struct StatementLine {
     StoredAmount due;
     StoredAmount paid;
     QString document;
-    QString origin;        // "" active, "Inactivo", "Histórico"
-    qint64 balance = 0;    // the open amount so far, in cents
+    QString origin;      // "" active, "Inactivo", "Histórico"
+    qint64 balance = 0;  // the open amount so far, in cents
 
     // The line's open amount; Null amounts count as 0, unreadable ones leave it unknown.
     bool openKnown() const { return !due.unreadable() && !paid.unreadable(); }

@@ -15,13 +15,13 @@ class Connection;
 struct MonthTypeFigures {
     int tipo = 0;
     QString ref;
-    int members = 0;          // members charged
-    int dues = 0;             // movements
-    qint64 charged = 0;       // sum of quota
-    qint64 deducted = 0;      // paid without a document: what the employer's list posted
-    qint64 paidOtherwise = 0; // paid with a document, in the record window
-    qint64 open = 0;          // charged - deducted - paidOtherwise
-    int unreadable = 0;       // amounts left out of the sums
+    int members = 0;           // members charged
+    int dues = 0;              // movements
+    qint64 charged = 0;        // sum of quota
+    qint64 deducted = 0;       // paid without a document: what the employer's list posted
+    qint64 paidOtherwise = 0;  // paid with a document, in the record window
+    qint64 open = 0;           // charged - deducted - paidOtherwise
+    int unreadable = 0;        // amounts left out of the sums
 
     MonthTypeFigures& operator+=(const MonthTypeFigures& other);
 };
@@ -32,9 +32,9 @@ struct MonthSummary {
     int year = 0;
     int month = 0;
     std::array<MonthTypeFigures, 2> types;  // Sindicato, Seguro
-    int rejectedLines = 0;          // rows of extras: the last import's rejects
+    int rejectedLines = 0;                  // rows of extras: the last import's rejects
     int membersWithoutAccount = 0;
-    int duesNotComputed = 0;        // dues of the month generation cannot compute
+    int duesNotComputed = 0;  // dues of the month generation cannot compute
 
     MonthTypeFigures total() const;
 };

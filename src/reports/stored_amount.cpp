@@ -20,7 +20,7 @@ StoredAmount readStoredAmount(const QVariant& value)
         return a;
     bool ok = false;
     const double number = value.metaType().id() == QMetaType::QString ? value.toString().trimmed().toDouble(&ok)
-                                                                     : value.toDouble(&ok);
+                                                                      : value.toDouble(&ok);
     if (!ok || !std::isfinite(number) || std::fabs(number) > kLargestAmount) {
         a.state = StoredAmount::State::Unreadable;
         a.text = value.toString();

@@ -10,7 +10,11 @@ namespace quotas {
 // NUMERIC(12,2) holds). The reports count what they cannot read instead of
 // printing it as 0.
 struct StoredAmount {
-    enum class State { Null, Readable, Unreadable };
+    enum class State {
+        Null,
+        Readable,
+        Unreadable
+    };
     State state = State::Null;
     qint64 cents = 0;  // Readable: the amount in whole cents, half to even
     QString text;      // Unreadable: the stored value as text

@@ -109,7 +109,8 @@ private slots:
                              {"12/2003|Sindicato|0,00|0,00|Histórico", "01/2004|Sindicato|0,00|0,00|",
                               "02/2004|Sindicato|20,00|20,00|", "02/2004|Sindicato|12,00|32,00|Inactivo",
                               "02/2004|Seguro|5,00|37,00|"},
-                             "102,00|65,00|37,00", false};
+                             "102,00|65,00|37,00",
+                             false};
     }
     void statementRunsTheBalanceInOrder()
     {
@@ -118,8 +119,7 @@ private slots:
         const MemberStatement s = readMemberStatement(db->connection(), c.request);
         QStringList lines;
         for (const StatementLine& l : s.lines)
-            lines << u"%1/%2|%3|%4|%5|%6"_s.arg(l.mes, 2, 10, QLatin1Char('0')).arg(l.ano).arg(l.ref, cents(l.open()),
-                                                                                           cents(l.balance), l.origin);
+            lines << u"%1/%2|%3|%4|%5|%6"_s.arg(l.mes, 2, 10, QLatin1Char('0')).arg(l.ano).arg(l.ref, cents(l.open()), cents(l.balance), l.origin);
         QCOMPARE(lines, c.lines);
         QCOMPARE(u"%1|%2|%3"_s.arg(cents(s.charged), cents(s.paid), cents(s.open())), c.totals);
         QCOMPARE(s.accountDiffers, c.differs);
@@ -162,10 +162,10 @@ private slots:
         db->connection().execute(u"INSERT INTO tbEmpresas (code, percent_sindicato) VALUES ('TAP', 0.015), ('SEM', NULL)"_s);
         member(1, u"101"_s, u"Ana Silva"_s, 40.0, 0.0, u"TAP"_s, 1);
         member(2, u"102"_s, u"Bruno Costa"_s, 33.33, 0.0, u"TAP"_s);
-        member(3, u"103"_s, u"Carla Dias"_s, 25.1, 0.0, u"SEM"_s, 1);  // insured; her insurance cannot be computed
-        member(4, u"104"_s, u"Duarte Reis"_s);                            // no account
-        for (const Movement& m : {Movement{"", 1, 2004, 3, 1, 30.0, 30.0, ""},        // deducted by the list
-                                  Movement{"", 1, 2004, 3, 2, 10.0, 4.0, "R-1"},      // paid at the desk
+        member(3, u"103"_s, u"Carla Dias"_s, 25.1, 0.0, u"SEM"_s, 1);             // insured; her insurance cannot be computed
+        member(4, u"104"_s, u"Duarte Reis"_s);                                    // no account
+        for (const Movement& m : {Movement{"", 1, 2004, 3, 1, 30.0, 30.0, ""},    // deducted by the list
+                                  Movement{"", 1, 2004, 3, 2, 10.0, 4.0, "R-1"},  // paid at the desk
                                   Movement{"", 2, 2004, 3, 1, 33.33, 0.01, ""},
                                   Movement{"", 2, 2004, 2, 1, 99.0, 0.0, ""},         // another month
                                   Movement{"", 3, 2004, 3, 1, 25.1, nullMoney, ""}})  // unpaid, before maintenance

@@ -126,8 +126,8 @@ MemberStatement readMemberStatement(Connection& connection, const StatementReque
             line.tipo = rs.value(3).toInt();
             line.ref = rs.value(4).toString();
             line.quotaNo = rs.value(5);
-            line.due = readStoredAmount(rs.value(6));
-            line.paid = readStoredAmount(rs.value(7));
+            line.due = readReportAmount(rs.value(6));
+            line.paid = readReportAmount(rs.value(7));
             line.document = rs.value(8).toString();
             line.origin = QString::fromUtf8(kTables[t].origin);
             if (t == 0) {
@@ -154,8 +154,8 @@ MemberStatement readMemberStatement(Connection& connection, const StatementReque
             balance += line.open();
         line.balance = balance;
     }
-    const StoredAmount storedCharged = readStoredAmount(member.value(QStringLiteral("total_quotas")));
-    const StoredAmount storedPaid = readStoredAmount(member.value(QStringLiteral("total_pago")));
+    const StoredAmount storedCharged = readReportAmount(member.value(QStringLiteral("total_quotas")));
+    const StoredAmount storedPaid = readReportAmount(member.value(QStringLiteral("total_pago")));
     s.storedCharged = storedCharged;
     s.storedPaid = storedPaid;
     if (s.hasAccount)

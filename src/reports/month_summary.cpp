@@ -64,8 +64,8 @@ int duesNotComputed(Connection& connection, int year, int month, const std::arra
             continue;
         }
         const qint64 socio = members.value(0).toLongLong();
-        const bool remunerations = readStoredAmount(members.value(5)).readable()
-                                   && readStoredAmount(members.value(6)).readable();
+        const bool remunerations = readReportAmount(members.value(5)).readable()
+                                   && readReportAmount(members.value(6)).readable();
         const QString employer = members.value(1).toString();
         const bool employerFound = !members.value(1).isNull() && employerRates.contains(employer);
         for (const DueType type : {DueType::Sindicato, DueType::Seguro}) {
@@ -137,8 +137,8 @@ MonthSummary readMonthSummary(Connection& connection, int year, int month)
         MonthTypeFigures& f = s.types[size_t(t)];
         charged[size_t(t)].insert(rs.value(0).toLongLong());
         ++f.dues;
-        const StoredAmount due = readStoredAmount(rs.value(2));
-        const StoredAmount paid = readStoredAmount(rs.value(3));
+        const StoredAmount due = readReportAmount(rs.value(2));
+        const StoredAmount paid = readReportAmount(rs.value(3));
         f.unreadable += int(due.unreadable()) + int(paid.unreadable());
         f.charged += due.centsOrZero();
         if (rs.value(4).toString().trimmed().isEmpty())

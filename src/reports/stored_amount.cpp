@@ -13,7 +13,7 @@ constexpr double kLargestAmount = 9999999999.99;
 
 }  // namespace
 
-StoredAmount readStoredAmount(const QVariant& value)
+StoredAmount readReportAmount(const QVariant& value)
 {
     StoredAmount a;
     if (!value.isValid() || value.isNull())

@@ -25,6 +25,6 @@ struct StoredAmount {
     qint64 centsOrZero() const { return readable() ? cents : 0; }
 };
 
-StoredAmount readStoredAmount(const QVariant& value);
+StoredAmount readReportAmount(const QVariant& value);
 
 }  // namespace quotas

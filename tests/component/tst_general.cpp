@@ -1,4 +1,4 @@
-// The public class: its interface, Registo's early returns, the shared
+// The public class: Registo's early returns, the shared
 // objects and the progress window.
 
 #include "component/general.h"
@@ -8,7 +8,6 @@
 #include "platform/late_binding.h"
 #include "support/test_database.h"
 
-#include <QMetaMethod>
 #include <QProgressBar>
 #include <QLabel>
 #include <QTest>
@@ -20,19 +19,6 @@ class GeneralTest : public QObject {
     Q_OBJECT
 private slots:
     void cleanup() { releaseShared(); }
-
-    void theSevenMethodsInTheirOrder()
-    {
-        QStringList names;
-        const QMetaObject& meta = General::staticMetaObject;
-        for (int i = meta.methodOffset(); i < meta.methodCount(); ++i) {
-            const QString name = QString::fromLatin1(meta.method(i).name());
-            if (!names.contains(name))
-                names << name;
-        }
-        QCOMPARE(names, QStringList({"CallManutencaoDados", "ListagemDividas", "CartasDividas", "ImportarQuotas",
-                                     "GerarQuotas", "AnularGeracao", "Login", "Registo", "ExtratoQuotas", "ResumoMes"}));
-    }
 
     void registoWithoutAKeyOrRowsShowsNothing()
     {

@@ -63,34 +63,12 @@ QStringList texts(const ReportDocument& doc, const QStringList& names)
     return lines;
 }
 
-QList<int> tops(const ReportDocument& doc, const QString& name)
-{
-    QList<int> found;
-    for (const PlacedItem* item : placed(doc, name))
-        found << item->rect.top();
-    return found;
-}
-
 QList<int> countsPerPage(const ReportDocument& doc, const QString& name)
 {
     QList<int> counts;
     for (int p = 0; p < doc.pageCount(); ++p)
         counts << int(placed(doc, name, p).size());
     return counts;
-}
-
-// The first item of that name as "text | left,top widthxheight | font | alignment",
-// placed from the report's left edge and from top.
-QString describe(const ReportDocument& doc, const QString& name, int top)
-{
-    const auto found = placed(doc, name);
-    if (found.empty())
-        return u"no item "_s + name;
-    const PlacedItem& p = *found.front();
-    const ReportFont& f = p.item->font;
-    const QRect r = p.rect.translated(-PaperSetup::leftMargin(*doc.layout), -top);
-    const char* aligns[] = {"left", "center", "right"};
-    return u"%1 | %2,%3 %4x%5 | %6 %7%8%9 | %10"_s.arg(p.text).arg(r.left()).arg(r.top()).arg(r.width()).arg(r.height()).arg(f.family).arg(f.pointSize).arg(f.bold ? " bold" : "", f.italic ? " italic" : "", aligns[int(p.item->align)]);
 }
 
 // A layout of one detail and a report footer with a count, laid out over rows numbered 1 to count.
@@ -117,15 +95,8 @@ struct Pages {
     QList<int> perPage;
 };
 
-struct Place {
-    const char *report, *name;
-    int bandTop;
-    QString expected;  // text | left,top in the band widthxheight | font | alignment
-};
-
 }  // namespace
 Q_DECLARE_METATYPE(Pages)
-Q_DECLARE_METATYPE(Place)
 
 class ReportsTest : public QObject {
     Q_OBJECT
@@ -235,40 +206,6 @@ private slots:
         QCOMPARE(countsPerPage(doc, u"count"_s).last(), p.reportFooter ? 1 : 0);
     }
 
-    void showsTextsInTheirFontsAndPlaces_data()
-    {
-        QTest::addColumn<Place>("place");
-        const int rh = PaperSetup::kTopMargin, ph = rh + 990, detail = ph + 428, rf = detail + 322;
-        const int pf = PaperSetup::kHeight - PaperSetup::kBottomMargin - 390;
-        const int xph = rh + 330, xdetail = xph + 428, xrf = xdetail + 337, xpf = pf - 45;  // the rejects listing's bands
-        const QString date = longPortugueseDate(QDate::currentDate());
-        for (const Place& p : std::initializer_list<Place>{
-                 {"listing", "lblTitulo", rh, u"Listagem de Quotas em Dívida por Associado | 90,135 10470x255 | Times New Roman 12 bold | center"_s},
-                 {"listing", "lblData", rh, date + u" | 5880,540 4665x240 | Arial 8.25 italic | right"_s},
-                 {"listing", "lblNoTap", ph, u"Nº TAP | 210,75 1425x240 | Arial 8.25 bold | left"_s},
-                 {"listing", "txtDivida", detail, u"1.234,56 Esc | 7800,45 2250x270 | Arial 8.25 | right"_s},
-                 {"listing", "lblProcessado", pf, u"Processado por Computador | 60,105 2130x225 | Arial 6.75 | left"_s},
-                 {"listing", "lblPaginaNo", pf, u"1 | 9090,105 585x240 | Arial 8.25 italic | right"_s},
-                 {"listing", "lblTotalRegistos", rf, u"Total de registos listados: | 5505,165 2310x195 | Arial 8.25 bold | left"_s},
-                 {"listing", "fnDividas", rf, u"1.234,56 Esc | 7860,555 1635x225 | Arial 8.25 | right"_s},
-                 {"letters", "txtNoTap", rh, u"101 | 4470,1935 1650x225 | Arial 8.25 | left"_s},
-                 {"letters", "lblData", rh, date + u" | 105,4755 5580x300 | Arial 9 italic | left"_s},
-                 {"letters", "lblRegularizacao", rh, u"Regularização de Débitos | 1065,5235 4065x300 | Arial 11.25 bold | left"_s},
-                 {"rejects", "Label8", rh, u"Listagem de Dados não Importados para a Base de Dados | 75,30 10470x255 | Times New Roman 12 bold | center"_s},
-                 {"rejects", "Label1", xph, u"Campo 1 | 75,75 1005x240 | Arial 8.25 bold | left"_s},
-                 {"rejects", "Text2", xdetail, u"100234 | 60,45 1020x270 | Arial 8.25 | left"_s},
-                 {"rejects", "Label18", xpf, u"Página: | 8490,105 570x255 | Arial 8.25 italic | left"_s},
-                 {"rejects", "Function1", xrf, u"1 | 9765,75 705x225 | Arial 8.25 | right"_s}})
-            QTest::addRow("%s %s", p.report, p.name) << p;
-    }
-    void showsTextsInTheirFontsAndPlaces()
-    {
-        QFETCH(Place, place);
-        addDebtor(1, u"101"_s, u"Ana Silva"_s, 1334.56, 100);
-        reject({u"100234"_s, u"b"_s, u"c"_s, u"d"_s});
-        QCOMPARE(describe(show(QString::fromLatin1(place.report)), QString::fromLatin1(place.name), place.bandTop), place.expected);
-    }
-
     void listsDebtsAboveOneEuroInOrderOfNameCountingStaffNumbers()
     {
         const struct {
@@ -306,11 +243,6 @@ private slots:
                  (QList<int>{43, 46, 11, 1, 1, 1, 0, 0, 1}));
         QCOMPARE(texts(doc, {u"lblPaginaNo"_s, u"lblPaginas"_s}) + texts(doc, {u"fnDividas"_s}),
                  (QStringList{"1|3", "2|3", "3|3", "5.250,00 Esc"}));  // 100 x 2 + (1 + ... + 100)
-        // The page header under the report header, then at the top; the page footer at the foot of each page; the
-        // report footer right after the last detail.
-        const int foot = PaperSetup::kHeight - PaperSetup::kBottomMargin - 390 + 105, lastDetail = 567 + 428 + 11 * 322;
-        QCOMPARE(tops(doc, u"lblNoTap"_s) + tops(doc, u"lblPaginaNo"_s) + tops(doc, u"fnDividas"_s),
-                 (QList<int>{567 + 990 + 75, 567 + 75, 567 + 75, foot, foot, foot, lastDetail + 555}));
     }
 
     void writesOneLetterPerPageWithTheMembersAddress()

@@ -2,6 +2,8 @@
 
 #include "platform/recordset.h"
 
+#include <QLocale>
+
 namespace quotas::test {
 
 QStringList rowsText(Connection& connection, const QString& sql, const QVariantList& params)
@@ -15,7 +17,7 @@ QStringList rowsText(Connection& connection, const QString& sql, const QVariantL
             if (v.isNull())
                 fields << QStringLiteral("-");
             else
-                fields << (v.typeId() == QMetaType::Double ? QString::number(v.toDouble(), 'g', 10) : v.toString());
+                fields << (v.typeId() == QMetaType::Double ? QString::number(v.toDouble(), 'f', QLocale::FloatingPointShortest) : v.toString());
         }
         rows << fields.join(u'|');
     }

@@ -70,9 +70,10 @@ QString registoText(const QString& where)
             rows.open(registoText(QStringLiteral(" WHERE tbQuotas_Movimentos.socio_id = %1").arg(members[i].toLongLong())),
                       c, Cursor::Dynamic, Lock::Optimistic);
             rows.moveFirst();
+            const QVariantList account = accountLastValues(rows);
             rows.setValue(QStringLiteral("rend1"), 1100.0);
             rows.setValue(QStringLiteral("quota"), 16.5);
-            gravarQuota(rows);
+            gravarQuota(rows, account);
             liquidarQuota(rows, 1.0, QStringLiteral("R"));
         }
     });

@@ -17,11 +17,6 @@ namespace quotas {
 
 namespace {
 
-QString invalidValue()
-{
-    return QStringLiteral("Tem de introduzir um valor válido neste campo.");
-}
-
 QString belowPaid()
 {
     return QStringLiteral("Este valor não é válido porque resultou numa quota inferior à parte já liquidada.");
@@ -35,6 +30,11 @@ bool activationOnly(Qt::FocusReason reason)
 }
 
 }  // namespace
+
+QString FrmQuota::invalidValue()
+{
+    return QStringLiteral("Tem de introduzir um valor válido neste campo.");
+}
 
 bool FrmQuota::isAmountField(const QObject* object) const
 {
@@ -128,12 +128,14 @@ QString FrmQuota::leaveRemuneration(QLineEdit* field, const QString& column, con
     const std::optional<double> typed = parseDecimal(field->text());
     if (!typed)
         return invalidValue();
-    const double due = (*typed + amountOf(Adodc1->value(otherColumn))) * participation();
+    // The due is computed from the remuneration as it will be stored.
+    const double remuneration = roundCents(*typed);
+    const double due = (remuneration + amountOf(Adodc1->value(otherColumn))) * participation();
     // Compared unrounded: a due that only rounding lifts to the paid part
     // is still below it.
     if (!(due >= amountOf(Adodc1->value(QStringLiteral("pago")))))
         return belowPaid();
-    Adodc1->setValue(column, roundCents(*typed));
+    Adodc1->setValue(column, remuneration);
     Adodc1->setValue(QStringLiteral("quota"), roundCents(due));
     showDue();
     showPorLiquidar();

@@ -75,6 +75,7 @@ void FrmQuota::bind(std::shared_ptr<Recordset> rows, const QVariant& pkey)
     if (!Adodc1->find(QStringLiteral("quota_id"), pkey))
         Adodc1->moveFirst();
     m_asRead = movementAmounts(*Adodc1);
+    m_accountAsRead = accountLastValues(*Adodc1);
     showRow();
 }
 
@@ -126,10 +127,11 @@ void FrmQuota::Timer1_Timer()
 
 void FrmQuota::Gravar()
 {
-    if (!GravarPendente)
+    if (!GravarPendente || !Adodc1->editing())
         return;
-    gravarQuota(*Adodc1);
+    gravarQuota(*Adodc1, m_accountAsRead);
     m_asRead = movementAmounts(*Adodc1);
+    m_accountAsRead = accountLastValues(*Adodc1);
 }
 
 bool FrmQuota::gravarOrTell()

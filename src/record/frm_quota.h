@@ -42,6 +42,7 @@ public:
 
     // The save step: the movement's values become the account's last values,
     // then the movement is saved. Nothing happens while GravarPendente is
+    // false or nothing in the row was changed.
     // false. Throws DbError; nothing is written then.
     void Gravar();
 
@@ -103,6 +104,7 @@ private:
     QString leaveParticipation();
     double participation() const;
     void refuse(const QString& message);
+    static QString invalidValue();
     // Validates the field that has the focus before a button acts on the
     // row, as leaving it would; false when it refuses.
     bool validateActiveField();
@@ -119,6 +121,9 @@ private:
     // The movement's amounts as last read or saved, for the cancellation's
     // check that nobody changed them meanwhile.
     QVariantList m_asRead;
+    // The account's last values when the movement was read, for the save
+    // step's check that nobody changed them meanwhile.
+    QVariantList m_accountAsRead;
     // What each editable field held when the user entered it.
     QHash<const QLineEdit*, QString> m_textOnEnter;
     QLineEdit* m_restoring = nullptr;

@@ -42,7 +42,45 @@ bool sameValue(const QVariant& a, const QVariant& b, bool money)
     return a.toString() == b.toString();
 }
 
+const QStringList& accountLastColumns()
+{
+    static const QStringList columns = {QStringLiteral("ult_rend1"), QStringLiteral("ult_rend2"),
+                                        QStringLiteral("ult_quota_sindicato"), QStringLiteral("ult_perc_sindicato"),
+                                        QStringLiteral("ult_quota_seguro"), QStringLiteral("ult_perc_seguro")};
+    return columns;
+}
+
+QVariantList lastValuesOf(const Recordset& account)
+{
+    QVariantList values;
+    if (!account.eof()) {
+        for (const QString& column : accountLastColumns())
+            values << account.value(column);
+    }
+    return values;
+}
+
+bool sameLastValues(const QVariantList& now, const QVariantList& asRead)
+{
+    if (now.size() != asRead.size())
+        return false;
+    for (int i = 0; i < now.size(); ++i) {
+        if (!sameValue(now[i], asRead[i], !accountLastColumns()[i].startsWith(QLatin1String("ult_perc"))))
+            return false;
+    }
+    return true;
+}
+
 }  // namespace
+
+QVariantList accountLastValues(const Recordset& movement)
+{
+    Recordset account;
+    account.open(QStringLiteral("SELECT ") + accountLastColumns().join(QStringLiteral(", "))
+                     + QStringLiteral(" FROM tbQuotas_Socios WHERE socio_id = ?"),
+                 connectionOf(movement), Cursor::ForwardOnly, Lock::ReadOnly, {movement.value(QStringLiteral("socio_id"))});
+    return lastValuesOf(account);
+}
 
 const QStringList& movementAmountColumns()
 {
@@ -59,8 +97,10 @@ QVariantList movementAmounts(const Recordset& movement)
     return values;
 }
 
-void gravarQuota(Recordset& movement)
+void gravarQuota(Recordset& movement, const QVariantList& accountAsRead)
 {
+    if (!movement.editing())
+        return;
     Connection& connection = connectionOf(movement);
     const QVariant socio = movement.value(QStringLiteral("socio_id"));
     const QVariant rend1 = movement.value(QStringLiteral("rend1"));
@@ -78,6 +118,16 @@ void gravarQuota(Recordset& movement)
     Recordset account;
     account.open(QStringLiteral("Select * from tbQuotas_Socios where socio_id=?"), connection, Cursor::Keyset,
                  Lock::Optimistic, {socio});
+    // An account whose last values another user changed since the window
+    // read them is not overwritten; one that has gone is made again. Every
+    // last value is guarded, so the save checks them all once more.
+    if (!account.eof()) {
+        if (!sameLastValues(lastValuesOf(account), accountAsRead))
+            throw ConcurrencyError(QStringLiteral("A conta do associado foi alterada por outro utilizador depois de lida. "
+                                                  "As alterações não foram gravadas."));
+        for (const QString& column : accountLastColumns())
+            account.setValue(column, account.value(column));
+    }
     if (account.eof()) {
         account.addNew();
         account.setValue(QStringLiteral("socio_id"), socio);
@@ -96,8 +146,7 @@ void gravarQuota(Recordset& movement)
     account.update();
     account.close();
 
-    if (movement.editing())
-        guardWholeRow(movement);
+    guardWholeRow(movement);
     movement.update();
     tx.commit();
 }

@@ -22,11 +22,18 @@ const QStringList& movementAmountColumns();
 // last read or saved them.
 QVariantList movementAmounts(const Recordset& movement);
 
+// The last values of the member's dues account (the ult_ columns) as they
+// stand now; an empty list when the member has no account.
+QVariantList accountLastValues(const Recordset& movement);
+
 // The save step Gravar: the movement's remunerations, due and rate become
 // the last values of the member's dues account (a new account also takes
 // the movement's year and month), then the movement row is saved. The
-// account's totals are not touched.
-void gravarQuota(Recordset& movement);
+// account's totals are not touched. A movement without changes writes
+// nothing: a window that only looked must not put its stale values back.
+// Refused with ConcurrencyError when the account's last values are no
+// longer accountAsRead (accountLastValues when the window read the movement).
+void gravarQuota(Recordset& movement, const QVariantList& accountAsRead);
 
 // Records a payment: the account's total_pago grows by amount (added in the
 // database, so a payment another user records at the same time is kept; a

@@ -48,10 +48,14 @@ void FrmQuota::Command2_Click()
     const std::optional<double> typed = parseDecimal(*answer);
     if (!typed)
         return;
-    if (!gravarOrTell())
-        return;
+    // Refused before the save step: an amount that comes to nothing in
+    // cents must not leave the corrections saved with no payment and no word.
     const double amount = roundCents(*typed);
-    if (amount <= 0.0)
+    if (amount <= 0.0) {
+        refuse(invalidValue());
+        return;
+    }
+    if (!gravarOrTell())
         return;
 
     const double outstanding = roundCents(quota - pago);

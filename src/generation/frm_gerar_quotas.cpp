@@ -91,7 +91,7 @@ bool frmGerarQuotas::eventFilter(QObject* watched, QEvent* event)
         // Another window taking over (a message box, a menu) is not the user
         // leaving the field, and cancelling never needs a valid number.
         const bool leaving = reason != Qt::ActiveWindowFocusReason && reason != Qt::PopupFocusReason;
-        if (leaving && QApplication::focusWidget() != Command2 && isVisible() && !validateNoTap())
+        if (leaving && QApplication::focusWidget() != Command2 && isVisible() && !checkNoTap())
             No_Tap->setFocus(Qt::OtherFocusReason);
     }
     return QDialog::eventFilter(watched, event);
@@ -123,6 +123,21 @@ bool frmGerarQuotas::validateNoTap()
     m_socio = member->socioId;
     m_checkedOk = true;
     return true;
+}
+
+bool frmGerarQuotas::checkNoTap()
+{
+    // A lookup that fails (the database gone, say) must not escape the
+    // event handler; the number counts as unchecked, so Executar tries again.
+    try {
+        return validateNoTap();
+    } catch (const QuotasError& e) {
+        msgBox(e.message(), Buttons::Ok, Icon::Critical, kCaption);
+    } catch (const std::exception& e) {
+        msgBox(QString::fromLocal8Bit(e.what()), Buttons::Ok, Icon::Critical, kCaption);
+    }
+    m_checkedText.clear();
+    return false;
 }
 
 void frmGerarQuotas::execute()

@@ -45,6 +45,8 @@ private:
     // The lookup of the typed staff number; false (with the message) when
     // no member has it.
     bool validateNoTap();
+    // validateNoTap for an event handler: a failure is shown, never thrown.
+    bool checkNoTap();
     void execute();
 
     int m_socio = 0;

@@ -20,7 +20,8 @@ QString textForm(const QVariant& value)
     switch (value.metaType().id()) {
     case QMetaType::Double:
     case QMetaType::Float:
-        return local.toString(value.toDouble(), 'g', QLocale::FloatingPointShortest);
+        // Positional, never exponent notation: the callers read the text back as a number.
+        return local.toString(value.toDouble(), 'f', QLocale::FloatingPointShortest);
     case QMetaType::Int:
     case QMetaType::Short:
     case QMetaType::Long:

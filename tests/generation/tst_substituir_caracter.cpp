@@ -29,6 +29,16 @@ private slots:
         QTest::newRow("whole number") << QVariant(100000) << ","
                                       << "."
                                       << "100000";
+        // Regression: doubles of 100000 and above came out as "1E+05".
+        QTest::newRow("large double") << QVariant(100000.0) << ","
+                                      << "."
+                                      << "100000";
+        QTest::newRow("large double, local text") << QVariant(1234567.5) << "."
+                                                  << ","
+                                                  << "1234567,5";
+        QTest::newRow("small double") << QVariant(0.000001) << ","
+                                      << "."
+                                      << "0.000001";
         QTest::newRow("text with points") << QVariant(QStringLiteral("1.234.5")) << "."
                                           << ","
                                           << "1,234,5";

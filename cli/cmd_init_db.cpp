@@ -21,7 +21,7 @@ int initDb(const QStringList& args)
     LoginSettings settings;
     QString missing;
     if (!readLoginSettings(settings, &missing))
-        throw UsageError(QStringLiteral("falta a configuração \"%1\" em %2 (use \"quotas config\").").arg(missing, registryPath()));
+        missingSetting(missing);
     Connection connection(QStringLiteral("init-db"));
     connection.setConnectionString(connectionString(settings));
     const ConnectionTarget target = ConnectionTarget::fromConnectionString(connection.connectionString());

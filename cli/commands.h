@@ -30,5 +30,8 @@ int resumo(const QStringList& args);
 // Runs Login on the shared data environment; a missing setting is a
 // UsageError naming it.
 void connectOrFail();
+// Throws the UsageError for a setting the reader did not find: the file and
+// line that could not be read when the file is malformed, else the setting.
+[[noreturn]] void missingSetting(const QString& name);
 
 }  // namespace quotas::cli

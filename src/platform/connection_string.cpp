@@ -9,7 +9,8 @@ QString quoteConnectionValue(const QString& value)
     const bool outerSpace = !value.isEmpty() && (value.front().isSpace() || value.back().isSpace());
     const bool hasDouble = value.contains(u'"');
     const bool hasSingle = value.contains(u'\'');
-    if (!outerSpace && !hasDouble && !hasSingle && !value.contains(u';'))
+    // A leading "=" would read as the escaped "=" of a longer keyword.
+    if (!outerSpace && !hasDouble && !hasSingle && !value.contains(u';') && !value.startsWith(u'='))
         return value;
     if (!hasDouble)
         return u'"' + value + u'"';

@@ -1,6 +1,7 @@
 #include "settings/password.h"
 
 #include <QByteArray>
+#include <QStringDecoder>
 
 namespace quotas {
 
@@ -17,7 +18,9 @@ QString decodePassword(const QString& stored)
 {
     if (!stored.startsWith(kPrefix))
         return stored;
-    return QString::fromUtf8(QByteArray::fromBase64(stored.mid(kPrefix.size()).toLatin1()));
+    // A leading U+FEFF is part of the password, not a byte order mark.
+    QStringDecoder utf8(QStringDecoder::Utf8, QStringDecoder::Flag::Stateless | QStringDecoder::Flag::ConvertInitialBom);
+    return utf8(QByteArray::fromBase64(stored.mid(kPrefix.size()).toLatin1()));
 }
 
 }  // namespace quotas

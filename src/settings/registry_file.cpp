@@ -8,6 +8,7 @@
 #include <QFileInfo>
 #include <QSaveFile>
 #include <QStringDecoder>
+#include <QStringEncoder>
 #include <sys/stat.h>
 
 namespace quotas {
@@ -67,22 +68,50 @@ QByteArray parseHex(const QString& text, int line)
     return out;
 }
 
-QString decodeFile(const QByteArray& bytes)
+QString decodeFile(const QByteArray& bytes, RegistryFile::Encoding& encoding)
 {
+    using Encoding = RegistryFile::Encoding;
     if (bytes.startsWith("\xFF\xFE")) {
+        encoding = Encoding::Utf16LE;
         auto decoder = QStringDecoder(QStringDecoder::Utf16LE, QStringDecoder::Flag::Stateless);
         return decoder(bytes.mid(2));
     }
     if (bytes.startsWith("\xFE\xFF")) {
+        encoding = Encoding::Utf16BE;
         auto decoder = QStringDecoder(QStringDecoder::Utf16BE, QStringDecoder::Flag::Stateless);
         return decoder(bytes.mid(2));
     }
-    const QByteArray body = bytes.startsWith("\xEF\xBB\xBF") ? bytes.mid(3) : bytes;
-    auto utf8 = QStringDecoder(QStringDecoder::Utf8, QStringDecoder::Flag::Stateless);
+    const bool mark = bytes.startsWith("\xEF\xBB\xBF");
+    const QByteArray body = mark ? bytes.mid(3) : bytes;
+    auto utf8 = QStringDecoder(QStringDecoder::Utf8, QStringDecoder::Flag::Stateless | QStringDecoder::Flag::ConvertInitialBom);
     const QString text = utf8(body);
-    if (!utf8.hasError())
+    if (!utf8.hasError()) {
+        encoding = mark ? Encoding::Utf8Bom : Encoding::Utf8;
         return text;
+    }
+    encoding = Encoding::CodePage1252;
     return fromCodePage1252(body);  // an old REGEDIT4 file in the ANSI code page
+}
+
+QByteArray encodeFile(const QString& text, RegistryFile::Encoding encoding)
+{
+    using Encoding = RegistryFile::Encoding;
+    switch (encoding) {
+    case Encoding::Utf16LE:
+    case Encoding::Utf16BE: {
+        const bool little = encoding == Encoding::Utf16LE;
+        QStringEncoder encoder(little ? QStringEncoder::Utf16LE : QStringEncoder::Utf16BE, QStringEncoder::Flag::Stateless);
+        const QByteArray body = encoder(text);
+        return (little ? QByteArray("\xFF\xFE") : QByteArray("\xFE\xFF")) + body;
+    }
+    case Encoding::Utf8Bom:
+        return QByteArray("\xEF\xBB\xBF") + text.toUtf8();
+    case Encoding::CodePage1252:
+        return toCodePage1252(text);
+    case Encoding::Utf8:
+        break;
+    }
+    return text.toUtf8();
 }
 
 }  // namespace
@@ -92,14 +121,19 @@ RegistryFile RegistryFile::load(const QString& path)
     QFile file(path);
     if (!file.open(QIODevice::ReadOnly))
         throw QuotasError(QStringLiteral("Não foi possível ler o ficheiro de configuração \"%1\": %2").arg(path, file.errorString()));
-    return parse(file.readAll());
+    try {
+        return parse(file.readAll());
+    } catch (const QuotasError& e) {
+        throw QuotasError(QStringLiteral("%1: %2").arg(path, e.message()));
+    }
 }
 
 RegistryFile RegistryFile::parse(const QByteArray& bytes)
 {
-    const QString text = decodeFile(bytes);
-    const QStringList lines = text.split(u'\n');
     RegistryFile result;
+    const QString text = decodeFile(bytes, result.m_encoding);
+    const QStringList lines = text.split(u'\n');
+    result.m_crlf = !text.contains(u'\n') || text.contains(QStringLiteral("\r\n"));
     Key* current = nullptr;
     bool headerSeen = false;
     bool unicode = true;
@@ -118,6 +152,7 @@ RegistryFile RegistryFile::parse(const QByteArray& bytes)
             else
                 malformed(lineNumber, QStringLiteral("não é uma exportação do registo."));
             headerSeen = true;
+            result.m_version5 = unicode;
             continue;
         }
         // Binary values may continue over several lines ending in "\".
@@ -151,14 +186,11 @@ void RegistryFile::parseLine(const QString& raw, int lineNumber, Key*& current, 
                 return k.path.compare(path, Qt::CaseInsensitive) == 0
                        || k.path.startsWith(path + u'\\', Qt::CaseInsensitive);
             });
+            reindexKeys();
             current = nullptr;
             return;
         }
-        current = findKey(path);
-        if (!current) {
-            m_keys.push_back({path, {}});
-            current = &m_keys.back();
-        }
+        current = &addKey(path);
         return;
     }
     if (!current)
@@ -180,9 +212,14 @@ void RegistryFile::parseLine(const QString& raw, int lineNumber, Key*& current, 
     while (at < line.size() && line[at] == u' ')
         ++at;
     const QString data = line.mid(at);
-    std::erase_if(current->values, [&](const Value& v) { return v.name.compare(name, Qt::CaseInsensitive) == 0; });
-    if (data == QStringLiteral("-"))
+    const auto existing = current->byName.constFind(name.toLower());
+    if (data == QStringLiteral("-")) {
+        if (existing != current->byName.constEnd()) {
+            current->values.erase(current->values.begin() + qsizetype(*existing));
+            current->reindex();
+        }
         return;
+    }
     Value value;
     value.name = name;
     if (data.startsWith(u'"')) {
@@ -214,16 +251,42 @@ void RegistryFile::parseLine(const QString& raw, int lineNumber, Key*& current, 
     } else {
         malformed(lineNumber, QStringLiteral("valor inválido."));
     }
-    current->values.push_back(std::move(value));
+    // A value named again replaces the earlier one, in its place.
+    if (existing != current->byName.constEnd()) {
+        current->values[*existing] = std::move(value);
+    } else {
+        current->byName.insert(name.toLower(), current->values.size());
+        current->values.push_back(std::move(value));
+    }
+}
+
+void RegistryFile::Key::reindex()
+{
+    byName.clear();
+    for (size_t i = 0; i < values.size(); ++i)
+        byName.insert(values[i].name.toLower(), i);
+}
+
+void RegistryFile::reindexKeys()
+{
+    m_keyIndex.clear();
+    for (size_t i = 0; i < m_keys.size(); ++i)
+        m_keyIndex.insert(m_keys[i].path.toLower(), i);
+}
+
+RegistryFile::Key& RegistryFile::addKey(const QString& fullKey)
+{
+    if (Key* key = findKey(fullKey))
+        return *key;
+    m_keyIndex.insert(fullKey.toLower(), m_keys.size());
+    m_keys.push_back({fullKey, {}, {}});
+    return m_keys.back();
 }
 
 RegistryFile::Key* RegistryFile::findKey(const QString& fullKey)
 {
-    for (Key& k : m_keys) {
-        if (k.path.compare(fullKey, Qt::CaseInsensitive) == 0)
-            return &k;
-    }
-    return nullptr;
+    const auto found = m_keyIndex.constFind(fullKey.toLower());
+    return found == m_keyIndex.constEnd() ? nullptr : &m_keys[*found];
 }
 
 const RegistryFile::Key* RegistryFile::findKey(const QString& fullKey) const
@@ -245,9 +308,9 @@ std::optional<QByteArray> RegistryFile::data(const QString& fullKey, const QStri
     const Key* key = findKey(fullKey);
     if (!key)
         return std::nullopt;
-    for (const Value& v : key->values) {
-        if (v.name.compare(valueName, Qt::CaseInsensitive) != 0)
-            continue;
+    const auto found = key->byName.constFind(valueName.toLower());
+    if (found != key->byName.constEnd()) {
+        const Value& v = key->values[*found];
         if (v.type == String)
             return toCodePage1252(v.text) + QByteArray(1, '\0');
         if (v.wideText) {
@@ -263,25 +326,22 @@ std::optional<QByteArray> RegistryFile::data(const QString& fullKey, const QStri
 
 void RegistryFile::setString(const QString& fullKey, const QString& valueName, const QString& value)
 {
-    Key* key = findKey(fullKey);
-    if (!key) {
-        m_keys.push_back({fullKey, {}});
-        key = &m_keys.back();
+    Key& key = addKey(fullKey);
+    const auto found = key.byName.constFind(valueName.toLower());
+    if (found != key.byName.constEnd()) {
+        key.values[*found] = Value{valueName, String, value, {}, false};
+        return;
     }
-    for (Value& v : key->values) {
-        if (v.name.compare(valueName, Qt::CaseInsensitive) == 0) {
-            v = Value{valueName, String, value, {}, false};
-            return;
-        }
-    }
-    key->values.push_back(Value{valueName, String, value, {}, false});
+    key.byName.insert(valueName.toLower(), key.values.size());
+    key.values.push_back(Value{valueName, String, value, {}, false});
 }
 
 QByteArray RegistryFile::serialize() const
 {
-    QString out = kVersion5 + QStringLiteral("\r\n");
+    const QString end = m_crlf ? QStringLiteral("\r\n") : QStringLiteral("\n");
+    QString out = (m_version5 ? kVersion5 : kVersion4) + end;
     for (const Key& k : m_keys) {
-        out += QStringLiteral("\r\n[") + k.path + QStringLiteral("]\r\n");
+        out += end + u'[' + k.path + u']' + end;
         for (const Value& v : k.values) {
             out += v.name.isEmpty() ? QStringLiteral("@") : escaped(v.name);
             out += u'=';
@@ -299,14 +359,16 @@ QByteArray RegistryFile::serialize() const
                     bytes << QStringLiteral("%1").arg(uint(uchar(b)), 2, 16, QLatin1Char('0'));
                 out += bytes.join(u',');
             }
-            out += QStringLiteral("\r\n");
+            out += end;
         }
     }
-    return out.toUtf8();
+    return encodeFile(out, m_encoding);
 }
 
 void RegistryFile::save(const QString& path) const
 {
+    const QByteArray bytes = serialize();
+    parse(bytes);  // throws, and nothing is written, when it would not read back
     const QFileInfo info(path);
     if (!QDir().mkpath(info.absolutePath()))
         throw QuotasError(QStringLiteral("Não foi possível criar a pasta \"%1\".").arg(info.absolutePath()));
@@ -316,7 +378,7 @@ void RegistryFile::save(const QString& path) const
     // The file holds the database password: owner only, before any byte is written.
     if (::fchmod(file.handle(), S_IRUSR | S_IWUSR) != 0)
         throw QuotasError(QStringLiteral("Não foi possível proteger \"%1\".").arg(path));
-    file.write(serialize());
+    file.write(bytes);
     if (!file.commit())
         throw QuotasError(QStringLiteral("Não foi possível escrever \"%1\": %2").arg(path, file.errorString()));
 }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <QByteArray>
+#include <QHash>
 #include <QString>
 #include <optional>
 #include <vector>
@@ -25,10 +26,21 @@ public:
 
     void setString(const QString& fullKey, const QString& valueName, const QString& value);
 
-    // Writes "Windows Registry Editor Version 5.00" in UTF-8.
+    // Writes the file in the header, encoding and line ends it was read
+    // with; a new file is "Windows Registry Editor Version 5.00" in UTF-8
+    // with CRLF, as the registry editor writes it.
     QByteArray serialize() const;
-    // Replaces the file at once (never half-written), readable by its owner only.
+    // Replaces the file at once (never half-written), readable by its owner
+    // only. A file the reader would not read back is not written.
     void save(const QString& path) const;
+
+    enum class Encoding {
+        Utf8,
+        Utf8Bom,
+        Utf16LE,
+        Utf16BE,
+        CodePage1252
+    };
 
 private:
     enum : int {
@@ -49,13 +61,22 @@ private:
     struct Key {
         QString path;
         std::vector<Value> values;
+        QHash<QString, size_t> byName;  // lower-cased name -> position in values
+
+        void reindex();
     };
 
     Key* findKey(const QString& fullKey);
     const Key* findKey(const QString& fullKey) const;
+    Key& addKey(const QString& fullKey);
+    void reindexKeys();
     void parseLine(const QString& line, int lineNumber, Key*& current, bool unicode);
 
     std::vector<Key> m_keys;
+    QHash<QString, size_t> m_keyIndex;  // lower-cased path -> position in m_keys
+    Encoding m_encoding = Encoding::Utf8;
+    bool m_crlf = true;
+    bool m_version5 = true;
 };
 
 }  // namespace quotas

@@ -73,21 +73,46 @@ private slots:
         QCOMPARE(db->connection().scalar(QStringLiteral("SELECT COUNT(*) FROM tbSocios")).toInt(), 25);
     }
 
+    // Exit 2 with a message on stderr that names what is wrong; config
+    // writes nothing then.
     void usageProblemsExitWithTwo_data()
     {
         QTest::addColumn<QStringList>("args");
-        QTest::newRow("no command") << QStringList{};
-        QTest::newRow("unknown command") << QStringList{"voar"};
-        QTest::newRow("unknown option") << QStringList{"login", "--depressa"};
-        QTest::newRow("config without source") << QStringList{"config", "--user", "x"};
-        QTest::newRow("demo not a number") << QStringList{"init-db", "--demo", "muitos"};
+        QTest::addColumn<QString>("named");
+        QTest::newRow("no command") << QStringList{} << "Utilização";
+        QTest::newRow("unknown command") << QStringList{"voar"} << "voar";
+        QTest::newRow("unknown option") << QStringList{"login", "--depressa"} << "depressa";
+        QTest::newRow("config without source") << QStringList{"config", "--user", "x"} << "--data-source";
+        QTest::newRow("demo not a number") << QStringList{"init-db", "--demo", "muitos"} << "--demo";
+        // Regression: these were written into a file that no later run could read.
+        QTest::newRow("line break") << QStringList{"config", "--data-source", "q.db", "--user", "a\nb"} << "--user";
+        QTest::newRow("control character") << QStringList{"config", "--data-source", "q.db", "--catalog", "a\x01"} << "--catalog";
+        QTest::newRow("tab") << QStringList{"config", "--data-source", "q.db", "--security-info", "a\tb"} << "--security-info";
+        // Regression: read back as "dados/?ód?/q.db".
+        QTest::newRow("outside Windows-1252") << QStringList{"config", "--data-source", "dados/Łódź/q.db"} << "--data-source";
     }
     void usageProblemsExitWithTwo()
     {
         QFETCH(QStringList, args);
+        QFETCH(QString, named);
         const Run run = quotas(args);
         QCOMPARE(run.status, 2);
-        QVERIFY(!run.err.trimmed().isEmpty());
+        QVERIFY2(run.err.contains(named), qPrintable(run.err));
+        QVERIFY(!QFile::exists(registry));
+    }
+
+    // Regression: a malformed file was reported as a missing dtSecurityInfo.
+    void aMalformedSettingsFileIsNamedWithItsLine()
+    {
+        QCOMPARE(configure().status, 0);
+        QFile file(registry);
+        QVERIFY(file.open(QIODevice::Append));
+        file.write("\"dtUser\" sa\r\n");
+        file.close();
+        for (const QStringList& args : {QStringList{"login"}, QStringList{"init-db"}, QStringList{"config", "--data-source", "q.db"}}) {
+            const Run run = quotas(args);
+            QVERIFY2(run.status == 2 && run.err.contains(registry) && run.err.contains("linha 9"), qPrintable(run.err));
+        }
     }
 
     void anUnreachableDatabaseExitsWithOne()

@@ -33,6 +33,9 @@ private slots:
                                       << "\" x \"";
         QTest::newRow("equals sign") << "a=b"
                                      << "a=b";
+        // Regression: "User ID==x" reads as the escaped "=" of a keyword "User ID=".
+        QTest::newRow("leading equals sign") << "=x"
+                                             << "\"=x\"";
     }
     void quotingKeepsEveryValueWhole()
     {

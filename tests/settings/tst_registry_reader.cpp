@@ -1,14 +1,17 @@
 // The registry reader over a settings file: roots, key paths, the 255-byte
 // buffer, trimming, and the export formats an administrator may bring.
 
+#include "platform/errors.h"
 #include "settings/password.h"
 #include "settings/registry_file.h"
 #include "settings/registry_reader.h"
 #include "settings/settings_location.h"
 #include "support/scripted_boxes.h"
 
+#include <QElapsedTimer>
 #include <QFile>
 #include <QFileInfo>
+#include <QStringDecoder>
 #include <QStringEncoder>
 #include <QTemporaryDir>
 #include <QTest>
@@ -47,28 +50,6 @@ class RegistryReaderTest : public QObject {
 
 private slots:
     void cleanup() { setRegistryPath(QString()); }
-
-    void rootNames_data()
-    {
-        QTest::addColumn<QString>("name");
-        QTest::addColumn<quint32>("handle");
-        QTest::newRow("classes root") << "HKEY_CLASSES_ROOT" << 0x80000000u;
-        QTest::newRow("current user") << "HKEY_CURRENT_USER" << 0x80000001u;
-        QTest::newRow("local machine") << "HKEY_LOCAL_MACHINE" << 0x80000002u;
-        QTest::newRow("users") << "HKEY_USERS" << 0x80000003u;
-        QTest::newRow("performance data") << "HKEY_PERFORMANCE_DATA" << 0x80000004u;
-        QTest::newRow("current config") << "HKEY_CURRENT_CONFIG" << 0x80000005u;
-        QTest::newRow("dyn data") << "HKEY_DYN_DATA" << 0x80000006u;
-        QTest::newRow("lower case") << "hkey_local_machine" << 0u;
-        QTest::newRow("abbreviation") << "HKLM" << 0u;
-        QTest::newRow("unknown") << "HKEY_NOWHERE" << 0u;
-    }
-    void rootNames()
-    {
-        QFETCH(QString, name);
-        QFETCH(quint32, handle);
-        QCOMPARE(RootKeyHandle(name), handle);
-    }
 
     void keyPaths_data()
     {
@@ -189,24 +170,89 @@ private slots:
         QCOMPARE(query(kKey, QStringLiteral("dtUser")).toString(), QStringLiteral("João"));
     }
 
-    void writingKeepsOtherKeysAndHidesTheFile()
+    // Regression: a file from the registry editor (UTF-16 with its mark,
+    // CRLF) was written back as UTF-8.
+    void writingKeepsTheFileAsItWasAndHidesIt_data()
     {
-        const QString path = writeFile(QStringLiteral("Windows Registry Editor Version 5.00\r\n\r\n[HKEY_CURRENT_USER\\Outro]\r\n"
-                                                      "\"x\"=dword:0000002a\r\n\r\n[%1]\r\n\"dtUser\"=\"old\"\r\n")
-                                           .arg(kKey)
-                                           .toUtf8());
+        QTest::addColumn<QString>("header");
+        QTest::addColumn<QString>("encoding");  // UTF-16LE, UTF-8 or Windows-1252
+        QTest::addColumn<QString>("end");
+        QTest::newRow("registry editor: UTF-16, CRLF") << "Windows Registry Editor Version 5.00"
+                                                       << "UTF-16LE"
+                                                       << "\r\n";
+        QTest::newRow("UTF-8, LF") << "Windows Registry Editor Version 5.00"
+                                   << "UTF-8"
+                                   << "\n";
+        QTest::newRow("REGEDIT4, ANSI, CRLF") << "REGEDIT4"
+                                              << "Windows-1252"
+                                              << "\r\n";
+    }
+    void writingKeepsTheFileAsItWasAndHidesIt()
+    {
+        QFETCH(QString, header);
+        QFETCH(QString, encoding);
+        QFETCH(QString, end);
+        const QString text = QStringList{header, "", "[HKEY_CURRENT_USER\\Outro]", "\"x\"=dword:0000002a", "@=\"padrão\"",
+                                         "\"e\"=hex(2):4a,00,6f,00,\\", "  e3,00,00,00", "[HKEY_CURRENT_USER\\Outro\\Sub]",
+                                         "\"s\"=\"ç\"", "", QStringLiteral("[%1]").arg(kKey), "\"dtUser\"=\"old\"", ""}
+                                 .join(end);
+        const bool wide = encoding == "UTF-16LE";
+        QStringEncoder encoder(wide ? QStringEncoder::Utf16LE : QStringEncoder::Latin1);
+        const QByteArray bytes = encoding == "UTF-8" ? text.toUtf8() : QByteArray(wide ? "\xFF\xFE" : "") + QByteArray(encoder(text));
+        const QString path = writeFile(bytes);
+        const RegistryFile before = RegistryFile::load(path);
         RegistryFile file = RegistryFile::load(path);
-        file.setString(kKey, QStringLiteral("DTUSER"), QStringLiteral("new \"quoted\" \\ value"));
-        file.setString(kKey, QStringLiteral("dtPassword"), encodePassword(QStringLiteral("pá;ss")));
+        file.setString(kKey, QStringLiteral("DTUSER"), QStringLiteral("João \"quoted\" \\ value"));
+        file.setString(kKey, QStringLiteral("dtPassword"), encodePassword(QStringLiteral("\uFEFFpá;ss")));
         file.save(path);
         struct stat info {};
         QCOMPARE(::stat(QFile::encodeName(path).constData(), &info), 0);
         QCOMPARE(info.st_mode & 0777, 0600u);
-        QCOMPARE(query(kKey, QStringLiteral("dtUser")).toString(), QStringLiteral("new \"quoted\" \\ value"));
-        QCOMPARE(decodePassword(query(kKey, QStringLiteral("dtPassword")).toString()), QStringLiteral("pá;ss"));
+        QFile written(path);
+        QVERIFY(written.open(QIODevice::ReadOnly));
+        const QByteArray after = written.readAll();
+        QStringDecoder decoder(QStringDecoder::Utf16LE);
+        const QString afterText = wide ? QString(decoder(after.mid(2))) : QString::fromLatin1(after);
+        QVERIFY(after.startsWith(wide ? "\xFF\xFE" : "") && afterText.startsWith(header + end + end + "[HKEY_CURRENT_USER"));
+        QCOMPARE(afterText.count(QStringLiteral("\r\n")), end == "\n" ? 0 : afterText.count(u'\n'));
+        QCOMPARE(query(kKey, QStringLiteral("dtUser")).toString(), QStringLiteral("João \"quoted\" \\ value"));
+        // Regression: a leading U+FEFF of the password was taken for a byte order mark.
+        QCOMPARE(decodePassword(query(kKey, QStringLiteral("dtPassword")).toString()), QStringLiteral("\uFEFFpá;ss"));
         QCOMPARE(decodePassword(QStringLiteral("typed by hand")), QStringLiteral("typed by hand"));
-        QCOMPARE(RegistryFile::load(path).data(QStringLiteral("HKEY_CURRENT_USER\\Outro"), QStringLiteral("x")),
-                 std::optional<QByteArray>(QByteArray("\x2a\0\0\0", 4)));
+        const RegistryFile reread = RegistryFile::load(path);
+        const std::pair<const char*, const char*> kept[] = {{"HKEY_CURRENT_USER\\Outro", "x"}, {"HKEY_CURRENT_USER\\Outro", ""}, {"HKEY_CURRENT_USER\\Outro", "e"}, {"HKEY_CURRENT_USER\\Outro\\Sub", "s"}};
+        for (const auto& [key, value] : kept)
+            QCOMPARE(reread.data(QLatin1String(key), QLatin1String(value)), before.data(QLatin1String(key), QLatin1String(value)));
+    }
+
+    // Regression: 20,000 values took 8.9 s to read (each compared with all before it).
+    void readingIsLinear()
+    {
+        QByteArray bytes = "Windows Registry Editor Version 5.00\r\n\r\n[" + kKey.toLatin1() + "]\r\n";
+        for (int i = 0; i < 20000; ++i)
+            bytes += "\"v" + QByteArray::number(i) + "\"=\"" + QByteArray::number(i) + "\"\r\n";
+        QElapsedTimer timer;
+        timer.start();
+        const RegistryFile file = RegistryFile::parse(bytes);
+        QVERIFY2(timer.elapsed() < 2000, qPrintable(QString::number(timer.elapsed())));  // 0.5 s on an idle machine
+        QCOMPARE(file.data(kKey, QStringLiteral("V19999")), std::optional<QByteArray>(QByteArray("19999", 6)));
+    }
+
+    // A malformed file is reported with its name and line; a value the reader
+    // could not read back is never written.
+    void malformedFilesAreNamedAndNeverWritten()
+    {
+        const QString path = writeFile("Windows Registry Editor Version 5.00\r\n\r\n[HKEY_LOCAL_MACHINE\\X]\r\n\"a\"=\"1\"\r\n\"b\" 2\r\n");
+        try {
+            RegistryFile::load(path);
+            QFAIL("a malformed file was read");
+        } catch (const QuotasError& e) {
+            QVERIFY2(e.message().contains(path) && e.message().contains(QStringLiteral("linha 5")), qPrintable(e.message()));
+        }
+        RegistryFile file;
+        file.setString(kKey, QStringLiteral("dtUser"), QStringLiteral("a\nb"));
+        QVERIFY_THROWS_EXCEPTION(QuotasError, file.save(dir.filePath(QStringLiteral("never.reg"))));
+        QVERIFY(!QFileInfo::exists(dir.filePath(QStringLiteral("never.reg"))));
     }
 };
 

@@ -32,9 +32,10 @@ int gerar(const QStringList& args)
     const GenerationOutcome outcome = ProcessarQuotas(ano, mes, socio);
     msgBox(QStringLiteral("Fim do processamento de quotizações"), Buttons::Ok, Icon::Information,
            QStringLiteral("Gerar Quotas"));
-    if (outcome.notGenerated() > 0)
-        msgBox(outcome.summary(), Buttons::Ok, Icon::Exclamation, QStringLiteral("Gerar Quotas"));
-    return 0;
+    if (outcome.notGenerated() == 0)
+        return 0;
+    msgBox(outcome.summary(), Buttons::Ok, Icon::Exclamation, QStringLiteral("Gerar Quotas"));
+    return kLeftOut;
 }
 
 }  // namespace quotas::cli

@@ -6,6 +6,7 @@
 #include "import/rejects_listing.h"
 #include "platform/components.h"
 
+#include <QFile>
 #include <QFileInfo>
 #include <cstdio>
 
@@ -28,6 +29,9 @@ int importar(const QStringList& args)
     const QString pdf = options.isSet(QStringLiteral("pdf")) ? QFileInfo(options.value(QStringLiteral("pdf"))).absoluteFilePath()
                                                              : QString();
     connectOrFail();
+    // OUT always tells of this run: a listing left by an earlier one goes first.
+    if (!pdf.isEmpty() && QFileInfo::exists(pdf) && !QFile::remove(pdf))
+        throw QuotasError(QStringLiteral("não foi possível apagar a listagem anterior em %1.").arg(pdf));
 
     shared().SemSeparadorDecimal = options.isSet(QStringLiteral("sem-separador"));
     registerComponent(QStringLiteral("Dorvanta.General"),
@@ -55,6 +59,8 @@ int importar(const QStringList& args)
     }
     setRejectsListing({});
 
+    if (!summary.refusal.isEmpty())
+        throw QuotasError(summary.refusal);
     if (!summary.extrasSaved)
         throw QuotasError(QStringLiteral("os registos não importados não foram gravados na tabela extras."));
     if (!listingFailure.isEmpty())
@@ -64,7 +70,11 @@ int importar(const QStringList& args)
     if (listingWritten)
         std::fputs(QStringLiteral("Listagem dos registos não importados escrita em %1.\n").arg(pdf).toUtf8().constData(),
                    stdout);
-    return 0;
+    else if (!pdf.isEmpty())
+        std::fputs(QStringLiteral("Nenhuma linha foi rejeitada: não há listagem a escrever em %1.\n").arg(pdf).toUtf8().constData(),
+                   stdout);
+    // Done, but the rejected lines (counted on stdout) were left out.
+    return summary.rejected > 0 ? kLeftOut : 0;
 }
 
 }  // namespace quotas::cli

@@ -12,6 +12,10 @@ public:
     using QuotasError::QuotasError;
 };
 
+// The exit statuses: 0 done; kLeftOut done with something left out (the
+// count on stdout); 1 failed (the reason on stderr); 2 usage or settings.
+constexpr int kLeftOut = 3;
+
 // Each command takes the arguments after its name and returns the exit status.
 int config(const QStringList& args);
 int initDb(const QStringList& args);

@@ -1,6 +1,7 @@
 // quotas: the dues module from the command line, for cron jobs, scripts and
-// tests. Message boxes print as lines on stdout; exit status 0 on success,
-// 2 for a usage or settings problem, 1 for any other failure.
+// tests. Message boxes print as lines on stdout. Exit status 0 when all was
+// done, 3 when done with something left out (the count on stdout), 1 for a
+// failure (the reason on stderr), 2 for a usage or settings problem.
 
 #include "cli/commands.h"
 #include "cli/console_boxes.h"
@@ -31,7 +32,9 @@ const char* const kUsage =
     "  copiar --data-source HOST[,PORTA] --catalog BD --user U --password P\n"
     "  listagem --pdf SAIDA | cartas --pdf SAIDA | rejeitados --pdf SAIDA\n"
     "  extrato --no-tap N [--desde AAAA-MM] [--ate AAAA-MM] [--todos-os-movimentos] --pdf SAIDA\n"
-    "  resumo --ano A --mes M [--pdf SAIDA] [--csv SAIDA]\n";
+    "  resumo --ano A --mes M [--pdf SAIDA] [--csv SAIDA]\n"
+    "Estado de saída: 0 feito; 3 feito, mas ficou algo por fazer (quotas por gerar, linhas rejeitadas;\n"
+    "  a contagem sai no stdout); 1 falhou (a razão sai no stderr); 2 utilização ou configuração.\n";
 
 void printError(const QString& text)
 {

@@ -5,6 +5,8 @@
 
 #include <QFile>
 #include <QFileInfo>
+#include <QStringDecoder>
+#include <algorithm>
 #include <array>
 #include <csv.h>
 
@@ -22,7 +24,10 @@ struct ParseState {
 void onField(void* data, size_t length, void* state)
 {
     auto* s = static_cast<ParseState*>(state);
-    QString value = QString::fromUtf8(static_cast<const char*>(data), qsizetype(length));
+    // Only the file's first bytes can be a byte order mark (taken off when
+    // it was decoded); a U+FEFF opening a value is part of it.
+    QStringDecoder utf8(QStringDecoder::Utf8, QStringDecoder::Flag::Stateless | QStringDecoder::Flag::ConvertInitialBom);
+    QString value = utf8(QByteArrayView(static_cast<const char*>(data), qsizetype(length)));
     if (value.isNull())
         value = QStringLiteral("");  // an empty value is empty text, not Null
     s->fields << value;
@@ -49,6 +54,9 @@ public:
         if (csv_init(&m_parser, CSV_STRICT | CSV_STRICT_FINI) != 0)
             throw QuotasError(QStringLiteral("Não foi possível preparar a leitura do ficheiro CSV."));
         csv_set_delim(&m_parser, static_cast<unsigned char>(delimiter));
+        // The field buffer grows by this much at a time: the default of 128
+        // bytes makes a long line cost a reallocation every few values.
+        csv_set_blk_size(&m_parser, 64 * 1024);
         // With tab as the delimiter a tab must not be taken for padding.
         if (delimiter == '\t')
             csv_set_space_func(&m_parser, spaceOnly);
@@ -131,6 +139,9 @@ CsvTable parseCsv(const QString& text, const QString& fileName)
     table.rows.reserve(state.records.size() - 1);
     for (qsizetype r = 1; r < state.records.size(); ++r) {
         QStringList& row = state.records[r];
+        // Spreadsheet programs write a blank row as ";;;;": a blank line.
+        if (std::all_of(row.cbegin(), row.cend(), [](const QString& value) { return value.isEmpty(); }))
+            continue;
         if (row.size() > width) {
             // A delimiter left at the end of a line adds only empty values.
             for (qsizetype i = width; i < row.size(); ++i) {

@@ -164,16 +164,20 @@ struct Lines {
         return Outcome::Posted;
     }
 
-    // After a rollback the sets hold values the database no longer has.
+    // After a rollback the line's two rows hold values the database may no
+    // longer have (another user's change is why it failed): read those two
+    // again, not the whole sets, so a failed line costs the same as a posted one.
     void resynchronise()
     {
-        movements.cancelUpdate();
-        accounts.cancelUpdate();
-        try {
-            movements.requery();
-            accounts.requery();
-        } catch (const QuotasError&) {
-            // Left closed: the following lines fail and are listed too.
+        for (Recordset* set : {&movements, &accounts}) {
+            set->cancelUpdate();
+            if (!set->eof()) {
+                try {
+                    set->resync();
+                } catch (const QuotasError&) {
+                    // Left as read: a later line of that member fails and is listed too.
+                }
+            }
         }
     }
 };
@@ -257,7 +261,8 @@ ImportSummary ProcessarImportacao(int month, int year, int tipo)
         return summary;
     Recordset& source = set->rows();
     if (source.eof()) {
-        msgBox(QStringLiteral("Não foram indicados registos para importar."), Buttons::Ok, Icon::Information);
+        summary.refusal = QStringLiteral("Não foram indicados registos para importar.");
+        msgBox(summary.refusal, Buttons::Ok, Icon::Information);
         return summary;
     }
 
@@ -275,7 +280,8 @@ ImportSummary ProcessarImportacao(int month, int year, int tipo)
             rend1Column = i;
     }
     if (noTapColumn < 0 || quotaColumn < 0) {
-        msgBox(QStringLiteral("Não foram especificados os campos no_tap ou quota."), Buttons::Ok, Icon::Information);
+        summary.refusal = QStringLiteral("Não foram especificados os campos no_tap ou quota.");
+        msgBox(summary.refusal, Buttons::Ok, Icon::Information);
         return summary;
     }
 
@@ -298,15 +304,16 @@ ImportSummary ProcessarImportacao(int month, int year, int tipo)
     } catch (const QuotasError& e) {
         component.reset();
         progress.release();
-        msgBox(QStringLiteral("Não foi possível ler os registos de quotas: %1").arg(e.message()), Buttons::Ok,
-               Icon::Critical);
+        summary.refusal = QStringLiteral("Não foi possível ler os registos de quotas: %1").arg(e.message());
+        msgBox(summary.refusal, Buttons::Ok, Icon::Critical);
         return summary;
     }
 
     Recordset rejects;
     rejects.openInMemory(rejectColumns());
     if (movements.eof()) {
-        msgBox(QStringLiteral("Não foram processados os registos de quotas referente a %1 / %2.").arg(month).arg(year));
+        summary.refusal = QStringLiteral("Não foram processados os registos de quotas referente a %1 / %2.").arg(month).arg(year);
+        msgBox(summary.refusal);
     } else {
         Lines lines{source, movements, accounts, connection, quotaColumn,
                     rend1Column, shared().SemSeparadorDecimal, month, year, tipo};
@@ -316,6 +323,19 @@ ImportSummary ProcessarImportacao(int month, int year, int tipo)
             Outcome outcome = Outcome::Rejected;
             try {
                 outcome = lines.process();
+            } catch (const ConnectionLostError& e) {
+                // Every later line would fail too: the run stops here, and
+                // says so, rather than reject the rest of the file.
+                component.reset();
+                progress.release();
+                throw QuotasError(QStringLiteral("A importação das quotas de %1 / %2 parou na linha %3 do ficheiro: %4\n"
+                                                 "As %5 linhas lançadas até aí ficam gravadas. Volte a importar o mesmo "
+                                                 "ficheiro para a completar: as linhas já lançadas não se repetem.")
+                                      .arg(month)
+                                      .arg(year)
+                                      .arg(summary.lines + 1)
+                                      .arg(e.message())
+                                      .arg(summary.posted));
             } catch (const QuotasError&) {
                 ++summary.failed;
                 lines.resynchronise();

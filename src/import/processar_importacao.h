@@ -1,5 +1,6 @@
 #pragma once
 
+#include <QString>
 #include <functional>
 
 namespace quotas {
@@ -12,6 +13,9 @@ struct ImportSummary {
     int rejected = 0;         // lines listed in extras (failed ones included)
     int failed = 0;           // matched lines whose writes were rolled back
     bool extrasSaved = true;  // false when extras could not be rewritten
+    // Why no line was gone through (no lines, no no_tap or quota column, no
+    // dues charged, the dues unreadable), as the run told it; empty otherwise.
+    QString refusal;
 };
 
 // Posts the employer's list of deductions, obtained from the import source

@@ -6,9 +6,11 @@
 
 #include <QAtomicInt>
 #include <QFileInfo>
+#include <QSqlDriver>
 #include <QSqlError>
 #include <QSqlIndex>
 #include <QSqlQuery>
+#include <libpq-fe.h>
 
 namespace quotas {
 
@@ -148,8 +150,24 @@ void Connection::requireOpen() const
         throw DbError(QStringLiteral("A ligação \"%1\" à base de dados não está aberta.").arg(m_name));
 }
 
+bool Connection::lost() const
+{
+    if (!isOpen() || m_dialect->engine() != Engine::PostgreSQL)
+        return false;
+    // libpq knows whether its connection is gone.
+    const QVariant handle = QSqlDatabase::database(m_dbName, false).driver()->handle();
+    const char* type = handle.typeName();
+    if (!handle.isValid() || (qstrcmp(type, "PGconn*") != 0 && qstrcmp(type, "pg_conn*") != 0))
+        return false;
+    const PGconn* pg = *static_cast<PGconn* const*>(handle.constData());
+    return pg && PQstatus(pg) == CONNECTION_BAD;
+}
+
 void Connection::fail(const QString& what, const QString& sql, const QString& driverText) const
 {
+    if (lost())
+        throw ConnectionLostError(QStringLiteral("perdeu-se a ligação à base de dados (o servidor parou ou reiniciou, ou a "
+                                                 "rede falhou)."));
     throw DbError(QStringLiteral("Erro na base de dados ao %1: %2\n[%3]").arg(what, driverText.trimmed(), sql));
 }
 

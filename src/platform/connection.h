@@ -100,6 +100,8 @@ public:
 
 private:
     void requireOpen() const;
+    // True when the server is known to have gone (PostgreSQL only).
+    bool lost() const;
     [[noreturn]] void fail(const QString& what, const QString& sql, const QString& driverText) const;
 
     QString m_name;

@@ -29,4 +29,11 @@ public:
     using DbError::DbError;
 };
 
+// The database server went away (stopped, restarted, the network lost):
+// nothing more can be written on this connection.
+class ConnectionLostError : public DbError {
+public:
+    using DbError::DbError;
+};
+
 }  // namespace quotas

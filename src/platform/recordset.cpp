@@ -113,6 +113,35 @@ void Recordset::requery()
     open(sql, *connection, m_cursor, m_lock, params);
 }
 
+void Recordset::resync()
+{
+    cancelUpdate();
+    const int row = requireRow();
+    if (!m_connection)
+        return;
+    QStringList tables;
+    for (const Column& c : m_columns) {
+        if (!c.table.isEmpty() && !tables.contains(c.table, Qt::CaseInsensitive))
+            tables << c.table;
+    }
+    for (const QString& table : tables) {
+        int keyIndex = -1;
+        const QString key = primaryKeyColumn(table, &keyIndex);
+        if (keyIndex < 0 || cell(row, keyIndex).isNull())
+            continue;
+        QStringList names;
+        for (const Column& c : m_columns) {
+            if (c.table.compare(table, Qt::CaseInsensitive) == 0)
+                names << c.name;
+        }
+        QSqlQuery& q = m_connection->run(QStringLiteral("SELECT %1 FROM %2 WHERE %3 = ?").arg(names.join(u','), table, key),
+                                         {cell(row, keyIndex)});
+        if (q.next())  // a row gone stays as read: saving it again is refused
+            adoptReturned(row, table, q);
+        q.finish();
+    }
+}
+
 void Recordset::close()
 {
     m_open = false;

@@ -67,6 +67,10 @@ public:
     void requery();
     // Pending changes are dropped.
     void close();
+    // Drops the current row's pending changes and reads its columns again
+    // from their base tables by primary key: after a rollback, the one row
+    // a failed save touched, without reading the whole set again.
+    void resync();
 
     bool isOpen() const { return m_open; }
     int state() const { return m_open ? 1 : 0; }

@@ -232,6 +232,17 @@ private slots:
                  QStringList({"1|1|42", "4|1|43", "43"}));
     }
 
+    // A counter row holding Null counts from 1.
+    void aNullCounterCountsFromOne()
+    {
+        c().execute(QStringLiteral("INSERT INTO tbcontadores (quotas) VALUES (NULL)"));
+        member(1, "A1", "TAP", 1);
+        member(2);
+        run(2003, 1);
+        QCOMPARE(rows("SELECT quota_no FROM tbQuotas_Movimentos ORDER BY quota_no") + rows("SELECT quotas FROM tbcontadores"),
+                 QStringList({"1", "2", "3", "3"}));
+    }
+
     // Regression: a due was computed from an empty remuneration or rate.
     void emptyValuesAreReportedNotPosted()
     {
@@ -264,12 +275,15 @@ private slots:
         QVERIFY2(refused.status == 2 && refused.err.contains("Número de Empresa não existe!"), qPrintable(refused.err));
         QCOMPARE(gerar({"--ano", "2003", "--mes", "13"}).status, 2);
         QCOMPARE(dues(2003, 1), QStringList());
-        QCOMPARE(gerar({"--ano", "2003", "--mes", "1", "--no-tap", "1002"}).out, "Fim do processamento de quotizações\n");
+        const CliRun one = gerar({"--ano", "2003", "--mes", "1", "--no-tap", "1002"});
+        QCOMPARE(one.out + QString::number(one.status), "Fim do processamento de quotizações\n0");
         QCOMPARE(dues(2003, 1), QStringList{"2|1|37.5"});
-        QCOMPARE(gerar({"--ano", "2003", "--mes", "1"}).out,
+        const CliRun leftOut = gerar({"--ano", "2003", "--mes", "1"});
+        QCOMPARE(leftOut.out,
                  "Fim do processamento de quotizações\nNão foi gerada 1 quota: - 1 quota porque a conta do associado não tem a "
                  "remuneração 1 ou a remuneração 2 (Nº Empresa: 1003); Corrija estes valores e volte a gerar o mesmo mês: as "
                  "quotas já geradas não se repetem.\n");
+        QCOMPARE(leftOut.status, 3);
         QCOMPARE(dues(2003, 1), QStringList({"2|1|37.5", "1|1|37.5"}));
     }
 
@@ -430,6 +444,24 @@ private slots:
                                                                       "parou no associado com o Nº Empresa 1001"),
                  qPrintable(told(boxes).join(u'\n')));
         QVERIFY(d.isVisible() && !RecordingProgress::log().showing);
+    }
+
+    // Regression: a lookup that failed as the user left the staff number
+    // escaped the event handler, and closing the dialog crashed the host.
+    void dialogLookupFailureIsToldAndTheDialogStays()
+    {
+        member(1);
+        ScriptedBoxes boxes;
+        frmGerarQuotas& d = open();
+        Data().SqlServer.close();
+        typeStaffNumber("1001");
+        Data().SqlServer.open();
+        QVERIFY2(told(boxes).size() == 1 && told(boxes)[0].startsWith("Critical Ok [Gerar Quotas] "), qPrintable(told(boxes).join(u'\n')));
+        QCOMPARE(QApplication::focusWidget(), d.No_Tap);
+        // Executar checks the number again and runs for him.
+        boxes.answer(Answer::Yes);
+        QTest::mouseClick(d.Command1, Qt::LeftButton);
+        QCOMPARE(dues(2003, 1), QStringList{"1|1|37.5"});
     }
 
     void gerarQuotasShowsTheDialogModally()

@@ -21,7 +21,8 @@ inline const QHash<QString, QString> kTable = {
     {"SA", "tbQuotas_Socios"}, {"SI", "tbQuotas_Socios_Inactivos"}, {"A", "tbQuotas_Movimentos"}, {"I", "tbQuotas_Movimentos_Inactivos"}, {"H", "tbQuotas_Movimentos_Historico"}};
 
 // Accounts get ult_ano 2003 and nothing else; every movement a month of its
-// own, so the active table's one-due-a-month rule never trips.
+// own, so the active table's one-due-a-month rule never trips. Movements
+// alternate union and insurance dues: the totals count both.
 inline void insertRows(Connection& c, const QStringList& lines)
 {
     static int next = 0;
@@ -37,9 +38,10 @@ inline void insertRows(Connection& c, const QStringList& lines)
                       v);
         else
             c.execute(QStringLiteral("INSERT INTO %1 (socio_id, data, ano, mes, quota_no, tipo, ref, rend1, rend2, quota, pago) "
-                                     "VALUES (?, ?, ?, ?, ?, 1, 'Sindicato', ?, ?, ?, ?)")
+                                     "VALUES (?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?)")
                           .arg(kTable[f[0]]),
-                      QVariantList{v[0], QDate(2000 + n / 12, 1 + n % 12, 1), 2000 + n / 12, 1 + n % 12, n}
+                      QVariantList{v[0], QDate(2000 + n / 12, 1 + n % 12, 1), 2000 + n / 12, 1 + n % 12, n, 1 + n % 2,
+                                   n % 2 ? QStringLiteral("Seguro") : QStringLiteral("Sindicato")}
                           + (v.size() == 3 ? QVariantList{1000.0, 0.0} : QVariantList()) + v.mid(1));
     }
 }

@@ -191,6 +191,7 @@ UndoOutcome AnularGeracao(Connection& connection, const UndoPlan& plan)
                                  .arg(connection.dialect().addToColumn(QStringLiteral("total_quotas")));
     UndoOutcome outcome;
     DuesAccount account;
+    LazyCommits lazy(connection);
     for (qsizetype first = 0; first < plan.removed.size();) {
         const QVariant socio = plan.removed[first].socioId;
         qsizetype end = first;
@@ -215,6 +216,7 @@ UndoOutcome AnularGeracao(Connection& connection, const UndoPlan& plan)
         outcome.changedMeanwhile += int(end - first) - removed;
         first = end;
     }
+    lazy.finish();
     return outcome;
 }
 

@@ -15,7 +15,12 @@ namespace {
 
 QString amount(qint64 cents)
 {
-    static const QLocale portuguese(QLocale::Portuguese, QLocale::Portugal);
+    // Without grouping: large sums stay one unbroken word, easy to compare.
+    static const QLocale portuguese = [] {
+        QLocale l(QLocale::Portuguese, QLocale::Portugal);
+        l.setNumberOptions(QLocale::OmitGroupSeparator);
+        return l;
+    }();
     return portuguese.toString(double(cents) / 100.0, 'f', 2);
 }
 

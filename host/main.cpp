@@ -7,6 +7,7 @@
 #include "host/main_window.h"
 #include "platform/errors.h"
 #include "platform/message_boxes.h"
+#include "platform/portuguese.h"
 #include "settings/settings_location.h"
 
 #include <QApplication>
@@ -17,6 +18,9 @@ int main(int argc, char** argv)
     QApplication app(argc, argv);
     QApplication::setApplicationName(QStringLiteral("quotas-host"));
     QApplication::setApplicationDisplayName(QStringLiteral("Quotas"));
+    quotas::installPortugueseTranslation(app);
+    // The list that has the focus says so: a clerk moves between lists with Tab.
+    app.setStyleSheet(QStringLiteral("QAbstractItemView:focus { border: 2px solid palette(highlight); }"));
 
     QCommandLineParser parser;
     parser.addHelpOption();

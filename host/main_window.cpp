@@ -3,40 +3,52 @@
 #include "component/general.h"
 #include "component/money.h"
 #include "component/shared_objects.h"
+#include "host/member_register.h"
 #include "platform/errors.h"
 #include "platform/late_binding.h"
 #include "platform/message_boxes.h"
 #include "platform/recordset.h"
 #include "record/record_text.h"
 
+#include <QHBoxLayout>
 #include <QHeaderView>
+#include <QKeyEvent>
+#include <QLabel>
+#include <QLineEdit>
 #include <QMenuBar>
 #include <QMetaMethod>
 #include <QSignalBlocker>
 #include <QSplitter>
 #include <QStatusBar>
+#include <QTableView>
 #include <QTableWidget>
+#include <QVBoxLayout>
+#include <memory>
 
 namespace host {
 
 namespace {
 
-QString captionOf(const QByteArray& method)
-{
-    static const QHash<QByteArray, QString> captions = {
-        {"CallManutencaoDados", QStringLiteral("&Manutenção de Dados")},
-        {"ListagemDividas", QStringLiteral("&Listagem de Dívidas")},
-        {"CartasDividas", QStringLiteral("&Cartas de Dívidas")},
-        {"ImportarQuotas", QStringLiteral("&Importar Quotas")},
-        {"GerarQuotas", QStringLiteral("&Gerar Quotas")},
-        {"AnularGeracao", QStringLiteral("&Anular Geração")},
-        {"Login", QStringLiteral("Ligar à &Base de Dados")},
-        {"Registo", QStringLiteral("&Registo de Quota")},
-        {"ExtratoQuotas", QStringLiteral("&Extrato de Quotas")},
-        {"ResumoMes", QStringLiteral("Res&umo do Mês")},
-    };
-    return captions.value(method, QString::fromLatin1(method));
-}
+// The menu: first the steps of a month's work, each with a key of its own,
+// then every other method of General.
+struct Entry {
+    const char* method;
+    const char* caption;
+    QKeySequence key;
+};
+const Entry kEntries[] = {
+    {"GerarQuotas", "&Gerar Quotas", Qt::Key_F2},
+    {"ImportarQuotas", "&Importar Quotas", Qt::Key_F3},
+    {"Registo", "&Registo de Quota", Qt::Key_F4},
+    {"CallManutencaoDados", "&Manutenção de Dados", Qt::Key_F5},
+    {"ListagemDividas", "&Listagem de Dívidas", Qt::Key_F6},
+    {"CartasDividas", "&Cartas de Dívidas", Qt::Key_F7},
+    {nullptr, nullptr, {}},
+    {"ExtratoQuotas", "&Extrato de Quotas", {}},
+    {"ResumoMes", "Res&umo do Mês", {}},
+    {"AnularGeracao", "&Anular Geração", {}},
+    {"Login", "Ligar à &Base de Dados", {}},
+};
 
 QTableWidgetItem* cell(const QString& text, bool number = false)
 {
@@ -47,36 +59,17 @@ QTableWidgetItem* cell(const QString& text, bool number = false)
     return item;
 }
 
-QTableWidget* table(QWidget* parent, const QStringList& headers, int stretch)
+template <typename View>
+void setUpList(View* v)
 {
-    auto* t = new QTableWidget(parent);
-    t->setColumnCount(int(headers.size()));
-    t->setHorizontalHeaderLabels(headers);
-    t->setSelectionBehavior(QAbstractItemView::SelectRows);
-    t->setSelectionMode(QAbstractItemView::SingleSelection);
-    t->verticalHeader()->hide();
-    t->verticalHeader()->setDefaultSectionSize(t->fontMetrics().height() + 6);
-    t->horizontalHeader()->setSectionResizeMode(QHeaderView::ResizeToContents);
-    t->horizontalHeader()->setSectionResizeMode(stretch, QHeaderView::Stretch);
-    return t;
-}
-
-// The row whose first cell carries key, -1 when none does.
-int rowOf(const QTableWidget* t, const QVariant& key)
-{
-    if (!key.isValid() || key.isNull())
-        return -1;
-    for (int row = 0; row < t->rowCount(); ++row) {
-        if (t->item(row, 0)->data(Qt::UserRole).toLongLong() == key.toLongLong())
-            return row;
-    }
-    return -1;
-}
-
-QVariant keyOf(const QTableWidget* t)
-{
-    const int row = t->currentRow();
-    return row < 0 ? QVariant() : t->item(row, 0)->data(Qt::UserRole);
+    v->setSelectionBehavior(QAbstractItemView::SelectRows);
+    v->setSelectionMode(QAbstractItemView::SingleSelection);
+    v->setEditTriggers(QAbstractItemView::NoEditTriggers);
+    v->verticalHeader()->hide();
+    v->verticalHeader()->setSectionResizeMode(QHeaderView::Fixed);
+    v->verticalHeader()->setDefaultSectionSize(v->fontMetrics().height() + 6);
+    // Fixed widths: sizing a column to its contents reads every row.
+    v->horizontalHeader()->setSectionResizeMode(QHeaderView::Interactive);
 }
 
 // The text the record window browses: the member's movements with the
@@ -94,61 +87,118 @@ QString movementsOf(const QVariant& socio)
 MainWindow::MainWindow(quotas::General& general, QWidget* parent)
     : QMainWindow(parent),
       m_general(general),
-      m_members(table(this, {QStringLiteral("Nº Empresa"), QStringLiteral("Nome"), QStringLiteral("Total Quotas"), QStringLiteral("Total Pago"), QStringLiteral("Em Dívida")},
-                      1)),
-      m_movements(table(this,
-                        {QStringLiteral("Data"), QStringLiteral("Ano"), QStringLiteral("Mês"), QStringLiteral("Número"),
-                         QStringLiteral("Tipo"), QStringLiteral("Remuneração (1)"), QStringLiteral("Remuneração (2)"),
-                         QStringLiteral("Quota"), QStringLiteral("Pago")},
-                        4))
+      m_register(new MemberRegister(this)),
+      m_filter(new MemberFilter(this)),
+      m_search(new QLineEdit(this)),
+      m_members(new QTableView(this)),
+      m_movements(new QTableWidget(this)),
+      m_status(new QLabel(this))
 {
     setWindowTitle(QStringLiteral("Sindicato - Registo de Associados"));
+    m_filter->setSourceModel(m_register);
     m_members->setObjectName(QStringLiteral("members"));
+    m_members->setModel(m_filter);
+    setUpList(m_members);
+    m_members->setSortingEnabled(true);
+    m_members->sortByColumn(MemberRegister::Nome, Qt::AscendingOrder);
+    const int digit = m_members->fontMetrics().horizontalAdvance(u'0');
+    const std::pair<int, int> widths[] = {{0, 12}, {2, 16}, {3, 16}, {4, 16}};  // in digits
+    for (const auto& [column, digits] : widths)
+        m_members->setColumnWidth(column, digit * digits);
+    m_members->horizontalHeader()->setSectionResizeMode(MemberRegister::Nome, QHeaderView::Stretch);
+
     m_movements->setObjectName(QStringLiteral("movements"));
+    m_movements->setColumnCount(9);
+    m_movements->setHorizontalHeaderLabels({QStringLiteral("Data"), QStringLiteral("Ano"), QStringLiteral("Mês"),
+                                            QStringLiteral("Número"), QStringLiteral("Tipo"), QStringLiteral("Remuneração (1)"),
+                                            QStringLiteral("Remuneração (2)"), QStringLiteral("Quota"), QStringLiteral("Pago")});
+    setUpList(m_movements);
+    m_movements->horizontalHeader()->setStretchLastSection(true);
+
+    m_search->setObjectName(QStringLiteral("search"));
+    m_search->setPlaceholderText(QStringLiteral("Número de empresa ou nome"));
+    m_search->setClearButtonEnabled(true);
+    auto* searchLabel = new QLabel(QStringLiteral("&Procurar:"), this);
+    searchLabel->setBuddy(m_search);
+    auto* searchRow = new QHBoxLayout;
+    searchRow->addWidget(searchLabel);
+    searchRow->addWidget(m_search, 1);
+
     auto* split = new QSplitter(Qt::Vertical, this);
     split->addWidget(m_members);
     split->addWidget(m_movements);
     split->setStretchFactor(0, 3);
     split->setStretchFactor(1, 2);
-    setCentralWidget(split);
-    connect(m_members, &QTableWidget::currentCellChanged, this, [this](int row, int, int previous) {
-        if (row != previous)
+    auto* central = new QWidget(this);
+    auto* column = new QVBoxLayout(central);
+    column->addLayout(searchRow);
+    column->addWidget(split, 1);
+    setCentralWidget(central);
+    // Permanent, so that the menu's hints do not wipe it.
+    statusBar()->addPermanentWidget(m_status, 1);
+
+    connect(m_search, &QLineEdit::textChanged, this, [this](const QString& text) {
+        const QVariant member = currentMember();
+        m_filter->setSearch(text);
+        selectFirstUnless(member);
+        if (currentMember() != member)
             refreshMovements();
+        showStatus();
     });
-    connect(m_movements, &QTableWidget::cellDoubleClicked, this, [this](int row) {
-        const QVariant key = m_movements->item(row, 0)->data(Qt::UserRole);
+    connect(m_members->selectionModel(), &QItemSelectionModel::currentRowChanged, this,
+            [this] { refreshMovements(); });
+    auto open = [this](const QVariant& key) {
         try {
             openMovement(key);
         } catch (const quotas::QuotasError& e) {
             quotas::msgBox(e.message(), quotas::Buttons::Ok, quotas::Icon::Critical);
         }
-        refreshMembers();
-    });
+    };
+    connect(m_movements, &QTableWidget::cellActivated, this,
+            [this, open](int row) { open(m_movements->item(row, 0)->data(Qt::UserRole)); });
+    connect(m_members, &QTableView::activated, this, [this] { m_movements->setFocus(); });
 
-    // One entry per method of General, in the order of its interface.
     QMenu* menu = menuBar()->addMenu(QStringLiteral("&Quotas"));
+    const auto add = [this, menu](const QByteArray& method, const QString& caption, const QKeySequence& key) {
+        QAction* action = menu->addAction(caption);
+        action->setObjectName(QString::fromLatin1(method));
+        action->setShortcut(key);
+        connect(action, &QAction::triggered, this, [this, method] { call(method); });
+    };
+    QList<QByteArray> listed;
+    for (const Entry& e : kEntries) {
+        if (!e.method) {
+            menu->addSeparator();
+            continue;
+        }
+        listed << e.method;
+        add(e.method, QString::fromUtf8(e.caption), e.key);
+    }
+    // A method General gained and the list above does not know yet.
     const QMetaObject& meta = quotas::General::staticMetaObject;
-    QList<QByteArray> seen;
     for (int i = meta.methodOffset(); i < meta.methodCount(); ++i) {
         const QByteArray name = meta.method(i).name();
-        if (meta.method(i).methodType() != QMetaMethod::Method || seen.contains(name))
-            continue;
-        seen << name;
-        QAction* action = menu->addAction(captionOf(name));
-        action->setObjectName(QString::fromLatin1(name));
-        connect(action, &QAction::triggered, this, [this, name] { call(name); });
+        if (meta.method(i).methodType() == QMetaMethod::Method && !listed.contains(name)) {
+            listed << name;
+            add(name, QString::fromLatin1(name), {});
+        }
     }
+    QAction* find = menu->addAction(QStringLiteral("&Procurar Associado"));
+    find->setShortcut(QKeySequence::Find);
+    connect(find, &QAction::triggered, this, [this] { m_search->setFocus(); m_search->selectAll(); });
     menu->addSeparator();
-    menu->addAction(QStringLiteral("&Sair"), this, &QWidget::close);
+    menu->addAction(QStringLiteral("&Sair"), QKeySequence(Qt::CTRL | Qt::Key_Q), this, &QWidget::close);
     resize(900, 600);
 }
 
 void MainWindow::call(const QByteArray& method)
 {
     try {
-        if (method == "Registo")
+        if (method == "Registo") {
             openRecord();
-        else if (method == "ExtratoQuotas") {
+            return;  // the record window's closing refreshes
+        }
+        if (method == "ExtratoQuotas") {
             if (currentMember().isValid())
                 m_general.ExtratoQuotas(currentMember());
             else
@@ -162,17 +212,58 @@ void MainWindow::call(const QByteArray& method)
     } catch (const quotas::QuotasError& e) {
         quotas::msgBox(e.message(), quotas::Buttons::Ok, quotas::Icon::Critical);
     }
+    if (method == "ImportarQuotas") {
+        // The import dialog stays open beside the register; the register is
+        // read again once it has closed, after its run.
+        if (QWidget* dialog = quotas::shared().frmImportarQuotas)
+            connect(dialog, &QObject::destroyed, this, &MainWindow::importClosed, Qt::UniqueConnection);
+        return;
+    }
+    refreshMembers();
+}
+
+void MainWindow::importClosed()
+{
     refreshMembers();
 }
 
 QVariant MainWindow::currentMember() const
 {
-    return keyOf(m_members);
+    const QModelIndex current = m_members->currentIndex();
+    return current.isValid() ? current.data(MemberRegister::KeyRole) : QVariant();
 }
 
 QVariant MainWindow::currentMovement() const
 {
-    return keyOf(m_movements);
+    const int row = m_movements->currentRow();
+    return row < 0 ? QVariant() : m_movements->item(row, 0)->data(Qt::UserRole);
+}
+
+void MainWindow::selectMember(const QVariant& socioId)
+{
+    placeSelection(socioId);
+    refreshMovements();
+}
+
+void MainWindow::placeSelection(const QVariant& socioId)
+{
+    const int row = socioId.isValid() ? m_register->rowOf(socioId.toLongLong()) : -1;
+    const QModelIndex index = row < 0 ? QModelIndex() : m_filter->mapFromSource(m_register->index(row, 0));
+    const QSignalBlocker blocker(m_members->selectionModel());
+    if (!index.isValid()) {
+        m_members->selectionModel()->clear();
+        return;
+    }
+    m_members->setCurrentIndex(index);
+    m_members->selectRow(index.row());
+    m_members->scrollTo(index);
+}
+
+void MainWindow::selectFirstUnless(const QVariant& socioId)
+{
+    placeSelection(socioId);
+    if (!currentMember().isValid() && m_filter->rowCount() > 0)
+        placeSelection(m_filter->index(0, 0).data(MemberRegister::KeyRole));
 }
 
 void MainWindow::openRecord()
@@ -198,13 +289,21 @@ void MainWindow::openMovement(const QVariant& quotaId)
     const QVariant socio = currentMember();
     if (!socio.isValid())
         return;
+    m_inRecord = true;
+    m_returnedKey = quotaId;
+    const std::shared_ptr<void> refresh(nullptr, [this](void*) {
+        m_inRecord = false;
+        refreshMembers(m_returnedKey);
+    });
     m_general.Registo(nullptr, quotaId, QString(), movementsOf(socio), this);
 }
 
 void MainWindow::RemoteKey(const QVariant& quotaId)
 {
-    refreshMembers();
-    refreshMovements(quotaId);
+    if (m_inRecord)
+        m_returnedKey = quotaId;
+    else
+        refreshMembers(quotaId);
 }
 
 void MainWindow::refreshMovements(const QVariant& select)
@@ -221,7 +320,7 @@ void MainWindow::refreshMovements(const QVariant& select)
                                "FROM tbQuotas_Movimentos WHERE socio_id = ? ORDER BY ano DESC, mes DESC, tipo"),
                 connection, quotas::Cursor::ForwardOnly, quotas::Lock::ReadOnly, {socio});
     } catch (const quotas::QuotasError& e) {
-        statusBar()->showMessage(e.message());
+        m_status->setText(e.message());
         return;
     }
     m_movements->setRowCount(rs.recordCount());
@@ -230,9 +329,12 @@ void MainWindow::refreshMovements(const QVariant& select)
         const QVariant v = rs.value(column);
         return cell(v.isNull() ? QString() : quotas::formatMoney(v.toDouble(), locale), true);
     };
+    int selected = -1;
     for (int row = 0; !rs.eof(); rs.moveNext(), ++row) {
         auto* date = cell(quotas::formatDataQuota(rs.value(1)));
         date->setData(Qt::UserRole, rs.value(0));
+        if (select.isValid() && rs.value(0).toLongLong() == select.toLongLong())
+            selected = row;
         m_movements->setItem(row, 0, date);
         for (int column = 2; column <= 4; ++column)
             m_movements->setItem(row, column - 1, cell(rs.value(column).toString(), true));
@@ -240,49 +342,43 @@ void MainWindow::refreshMovements(const QVariant& select)
         for (int column = 6; column <= 9; ++column)
             m_movements->setItem(row, column - 1, money(column));
     }
-    const int selected = rowOf(m_movements, select);
+    m_movements->resizeColumnsToContents();  // a member's movements are few
     if (selected >= 0)
         m_movements->setCurrentCell(selected, 0);
 }
 
-void MainWindow::refreshMembers()
+void MainWindow::refreshMembers(const QVariant& movement)
 {
     quotas::Connection& connection = quotas::Data().SqlServer;
     if (!connection.isOpen())
         return;
-    quotas::Recordset rs;
+    ++m_refreshes;
+    const QVariant member = currentMember();
+    const QVariant keep = movement.isValid() ? movement : currentMovement();
     try {
-        rs.open(QStringLiteral("SELECT tbSocios.socio_id, tbSocios.no_tap, tbSocios.nome, tbQuotas_Socios.total_quotas, "
-                               "tbQuotas_Socios.total_pago FROM tbSocios LEFT OUTER JOIN tbQuotas_Socios ON "
-                               "tbSocios.socio_id = tbQuotas_Socios.socio_id ORDER BY tbSocios.nome"),
-                connection, quotas::Cursor::ForwardOnly, quotas::Lock::ReadOnly);
+        m_register->reload(connection);
     } catch (const quotas::QuotasError& e) {
-        statusBar()->showMessage(e.message());
+        m_status->setText(e.message());
         return;
     }
-    const QVariant member = currentMember();
-    const QVariant movement = currentMovement();
-    const QSignalBlocker blocker(m_members);
-    m_members->setRowCount(rs.recordCount());
-    const QLocale locale;
-    for (int row = 0; !rs.eof(); rs.moveNext(), ++row) {
-        auto* number = cell(rs.value(1).toString());
-        number->setData(Qt::UserRole, rs.value(0));
-        m_members->setItem(row, 0, number);
-        m_members->setItem(row, 1, cell(rs.value(2).toString()));
-        const bool hasAccount = !rs.value(3).isNull();
-        const double charged = rs.value(3).toDouble();
-        const double paid = rs.value(4).toDouble();
-        m_members->setItem(row, 2, cell(hasAccount ? quotas::formatMoney(charged, locale) : QString(), true));
-        m_members->setItem(row, 3, cell(hasAccount ? quotas::formatMoney(paid, locale) : QString(), true));
-        m_members->setItem(row, 4, cell(hasAccount ? quotas::formatMoney(charged - paid, locale) : QString(), true));
-    }
     // The member chosen before stays chosen; at the start, the first one.
-    const int selected = rowOf(m_members, member);
-    if (selected >= 0 || m_members->rowCount() > 0)
-        m_members->setCurrentCell(std::max(selected, 0), 0);
-    refreshMovements(movement);
-    statusBar()->showMessage(QStringLiteral("%1 associados").arg(m_members->rowCount()));
+    selectFirstUnless(member);
+    refreshMovements(keep);
+    showStatus();
+}
+
+void MainWindow::showStatus()
+{
+    QStringList parts;
+    const int shown = m_filter->rowCount(), all = m_register->rowCount();
+    parts << (shown == all ? QStringLiteral("%1 associados").arg(all)
+                           : QStringLiteral("%1 de %2 associados").arg(shown).arg(all));
+    if (m_register->staleCount() > 0)
+        parts << QStringLiteral("%1 com totais guardados desactualizados (*): a \"Manutenção de Dados\" reconstrói-os")
+                     .arg(m_register->staleCount());
+    else if (all > 0 && !m_register->hasDues())
+        parts << QStringLiteral("Ainda não há quotas: comece por \"Gerar Quotas\" (F2)");
+    m_status->setText(parts.join(QStringLiteral(" · ")));
 }
 
 }  // namespace host

@@ -1,9 +1,9 @@
 #!/usr/bin/env bash
-# make run: set-up and build, then on first run a demo settings file and a
+# make run: set-up and build of the two programs, then on first run a demo settings file and a
 # demo SQLite database under var/, then the host application.
 set -euo pipefail
 cd "$(dirname "$0")/.."
-scripts/setup.sh
+scripts/setup.sh quotas-host quotas-cli  # only what the demo needs: no tests, no benchmark
 mkdir -p var
 export QUOTAS_REGISTRY=${QUOTAS_REGISTRY:-$PWD/var/registry.reg}
 if [ ! -f "$QUOTAS_REGISTRY" ]; then

@@ -1,6 +1,7 @@
 #!/usr/bin/env bash
 # Installs the Debian 12 packages the project needs (only the missing ones)
-# and builds everything into build/ (or $BUILD_DIR, in $BUILD_TYPE).
+# and builds into build/ (or $BUILD_DIR, in $BUILD_TYPE): the targets named as
+# arguments, else everything.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -13,6 +14,7 @@ packages=(
   libcsv-dev                                      # the RFC 4180 parser of the CSV import source
   clang-format                                    # scripts/check-format.sh
   libpq-dev                                       # libpq's header: COPY when copying to a server
+  qt6-translations-l10n                           # Qt's own texts in Portuguese (qtbase_pt_BR.qm)
 )
 missing=()
 for p in "${packages[@]}"; do
@@ -28,4 +30,4 @@ fi
 
 build_dir=${BUILD_DIR:-build}
 cmake -S . -B "$build_dir" -DCMAKE_BUILD_TYPE="${BUILD_TYPE:-RelWithDebInfo}" >/dev/null
-cmake --build "$build_dir" -j2
+cmake --build "$build_dir" -j2 ${1:+--target "$@"}

@@ -1,5 +1,6 @@
 #include "component/money.h"
 
+#include <algorithm>
 #include <cmath>
 
 namespace quotas {
@@ -11,13 +12,43 @@ double roundHalfEven(double value, int decimals)
     return std::nearbyint(value * scale) / scale;
 }
 
-std::optional<double> parseDecimal(const QString& text, const QLocale& locale)
+std::optional<double> parseDecimal(const QString& text)
 {
-    QString t = text.trimmed();
-    if (t.isEmpty())
+    const QString t = text.trimmed();
+    const qsizetype point = std::max(t.lastIndexOf(u'.'), t.lastIndexOf(u','));
+    const QStringView whole = point < 0 ? QStringView(t) : QStringView(t).left(point);
+    const QStringView fraction = point < 0 ? QStringView() : QStringView(t).mid(point + 1);
+    const QChar group = point < 0 ? QChar() : (t[point] == u'.' ? u',' : u'.');
+    QString plain;
+    qsizetype digits = 0, sinceGroup = 0;
+    bool grouped = false;
+    for (qsizetype i = 0; i < whole.size(); ++i) {
+        const QChar c = whole[i];
+        if ((c == u'-' || c == u'+') && i == 0) {
+            plain += c;
+        } else if (c.isDigit() && c.unicode() < 128) {
+            plain += c;
+            ++digits;
+            ++sinceGroup;
+        } else if ((c == group || c == u' ' || c == QChar::Nbsp || c == u'\u202f') && sinceGroup >= 1 && (grouped ? sinceGroup == 3 : sinceGroup <= 3)) {
+            grouped = true;
+            sinceGroup = 0;
+        } else {
+            return std::nullopt;
+        }
+    }
+    if (grouped && sinceGroup != 3)
         return std::nullopt;
+    for (const QChar c : fraction) {
+        if (!c.isDigit() || c.unicode() >= 128)
+            return std::nullopt;
+        ++digits;
+    }
+    if (digits == 0)
+        return std::nullopt;
+    plain += u'.' + fraction.toString();
     bool ok = false;
-    const double value = locale.toDouble(t, &ok);
+    const double value = QLocale::c().toDouble(plain, &ok);
     if (!ok || !std::isfinite(value))
         return std::nullopt;
     return value;

@@ -4,6 +4,7 @@
 
 #include <QObject>
 #include <QPointer>
+#include <QStringList>
 #include <QWidget>
 #include <memory>
 
@@ -31,6 +32,10 @@ struct SharedObjects {
 
     // Amounts in the import source are whole cents (no decimal point).
     bool SemSeparadorDecimal = false;
+    // Why each line of the last import's rejects was left out, in the order
+    // they were written to extras. Kept here rather than in a column, since
+    // extras belongs to the host's database and keeps its shape.
+    QStringList rejectReasons;
 };
 
 SharedObjects& shared();

@@ -42,13 +42,15 @@ frmGerarQuotas::frmGerarQuotas(QDate today, QWidget* parent) : QDialog(parent)
 
     Label3 = placed(new QLabel(QStringLiteral("Ano de Processamento:"), this), "Label3", twips(300, 180, 1755, 255));
     List1 = placed(new QListWidget(this), "List1", twips(300, 480, 1815, 2400));
-    Label2 = placed(new QLabel(QStringLiteral("Mês de Processamento:"), this), "Label2", twips(2700, 180, 1755, 255));
+    // Two captions a few pixels wider, as far as their neighbours allow: at
+    // the 8-point font they were cut ("Número de Empresa" lost its colon).
+    Label2 = placed(new QLabel(QStringLiteral("Mês de Processamento:"), this), "Label2", twips(2700, 180, 1815, 255));
     List2 = placed(new QListWidget(this), "List2", twips(2700, 480, 1815, 2400));
     Command1 = placed(new QPushButton(QStringLiteral("&Executar"), this), "Command1", twips(4920, 495, 1695, 375));
     Command2 = placed(new QPushButton(QStringLiteral("&Cancelar"), this), "Command2", twips(4920, 900, 1695, 375));
     Frame1 = placed(new QGroupBox(QStringLiteral("Processar Quotas para apenas um Associado:"), this), "Frame1",
                     twips(120, 3060, 6435, 1275));
-    Label4 = placed(new QLabel(QStringLiteral("Número de Empresa:"), Frame1), "Label4", twips(180, 420, 1515, 255));
+    Label4 = placed(new QLabel(QStringLiteral("Número de Empresa:"), Frame1), "Label4", twips(180, 420, 1560, 255));
     No_Tap = placed(new QLineEdit(Frame1), "No_Tap", twips(1740, 420, 1395, 285));
     Label1 = placed(new QLabel(QStringLiteral("Nome Completo:"), Frame1), "Label1", twips(180, 780, 1515, 255));
     Text2 = placed(new QLineEdit(Frame1), "Text2", twips(1740, 780, 4455, 285));
@@ -162,7 +164,8 @@ void frmGerarQuotas::execute()
         const int mes = List2->currentRow() + 1;
         const GenerationOutcome outcome = ProcessarQuotas(ano, mes, m_socio);
         accept();
-        msgBox(QStringLiteral("Fim do processamento de quotizações"), Buttons::Ok, Icon::Information, kCaption);
+        msgBox(QStringLiteral("Fim do processamento de quotizações\n\n") + outcome.counts(), Buttons::Ok, Icon::Information,
+               kCaption);
         if (outcome.notGenerated() > 0)
             msgBox(outcome.summary(), Buttons::Ok, Icon::Exclamation, kCaption);
     } catch (const QuotasError& e) {

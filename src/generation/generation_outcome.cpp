@@ -41,4 +41,12 @@ QString GenerationOutcome::summary() const
     return lines.join(u'\n');
 }
 
+QString GenerationOutcome::counts() const
+{
+    return QStringLiteral("Associados processados: %1\nQuotas lançadas: %2\nQuotas não lançadas: %3")
+        .arg(members)
+        .arg(posted)
+        .arg(notGenerated());
+}
+
 }  // namespace quotas

@@ -23,6 +23,9 @@ struct GenerationOutcome {
     // The Portuguese account of the dues not generated and why; empty when
     // every due could be posted.
     QString summary() const;
+    // How many members the run went through and how many dues it posted and
+    // left out, one per line, for the closing message.
+    QString counts() const;
 };
 
 }  // namespace quotas

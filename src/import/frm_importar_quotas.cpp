@@ -119,7 +119,10 @@ void FrmImportarQuotas::executar()
     // Nothing may escape into the event loop: what the run does not tell the
     // user itself (a file that cannot be read, say) is told here.
     try {
-        ProcessarImportacao(month, year, tipo);
+        const ImportSummary summary = ProcessarImportacao(month, year, tipo);
+        if (summary.lines > 0)
+            msgBox(QStringLiteral("Fim da importação de quotas.\n\n") + summary.counts(), Buttons::Ok, Icon::Information,
+                   windowTitle());
     } catch (const QuotasError& e) {
         msgBox(e.message(), Buttons::Ok, Icon::Critical);
     } catch (const std::exception& e) {

@@ -1,6 +1,7 @@
 #include "import/processar_importacao.h"
 
 #include "component/money.h"
+#include "component/month_names.h"
 #include "component/shared_objects.h"
 #include "generation/substituir_caracter.h"
 #include "import/import_recordset.h"
@@ -77,12 +78,7 @@ std::optional<double> readAmount(const QVariant& value, bool wholeCents)
 {
     if (!value.isValid() || value.isNull())
         return std::nullopt;
-    static const QLocale comma = [] {
-        QLocale l(QLocale::Portuguese, QLocale::Portugal);
-        l.setNumberOptions(QLocale::RejectGroupSeparator);
-        return l;
-    }();
-    const std::optional<double> number = parseDecimal(SubstituirCaracter(value, QStringLiteral("."), QStringLiteral(",")), comma);
+    const std::optional<double> number = parseDecimal(SubstituirCaracter(value, QStringLiteral("."), QStringLiteral(",")));
     if (!number)
         return std::nullopt;
     return roundCents(wholeCents ? *number / 100.0 : *number);
@@ -107,24 +103,33 @@ struct Lines {
     int year;
     int tipo;
 
+    // Why the last line was rejected, as the listing says it.
+    QString reason;
+
+    Outcome rejected(const char* why)
+    {
+        reason = QString::fromUtf8(why);
+        return Outcome::Rejected;
+    }
+
     Outcome process()
     {
         const QVariant key = source.value(0);
         movements.moveFirst();
         if (key.isNull() || !movements.find(QStringLiteral("no_tap"), key.toString()))
-            return Outcome::Rejected;
+            return rejected("sem quota gerada");
         // The account of the member whose movement was found, so that a staff
         // number two members share can never split one line between them.
         accounts.moveFirst();
         if (!accounts.find(QStringLiteral("socio_id"), movements.value(QStringLiteral("socio_id"))))
-            return Outcome::Rejected;
+            return rejected("sem conta");
 
         const std::optional<double> q = readAmount(source.value(quotaColumn), wholeCents);
         std::optional<double> r;
         if (rend1Column >= 0)
             r = readAmount(source.value(rend1Column), wholeCents);
         if (!q || (rend1Column >= 0 && !r))
-            return Outcome::Rejected;
+            return rejected("valor ilegível");
 
         const double charged = amountOf(movements.value(QStringLiteral("quota")));
         const bool unpaid = cents(amountOf(movements.value(QStringLiteral("pago")))) == 0;
@@ -182,9 +187,10 @@ struct Lines {
     }
 };
 
-void copyToRejects(Recordset& rejects, Recordset& source)
+void copyToRejects(Recordset& rejects, Recordset& source, const QString& reason)
 {
     rejects.addNew();
+    rejects.setValue(kRejectColumns, reason);
     const int n = std::min(source.fieldCount(), kRejectColumns);
     for (int i = 0; i < n; ++i) {
         const QVariant value = source.value(i);
@@ -238,10 +244,18 @@ QStringList rejectColumns()
     QStringList names;
     for (int i = 0; i < kRejectColumns; ++i)
         names << QStringLiteral("Field%1").arg(i);
-    return names;
+    return names << QStringLiteral("Motivo");  // beside the values, not written to extras
 }
 
 }  // namespace
+
+QString ImportSummary::counts() const
+{
+    return QStringLiteral("Linhas lançadas: %1\nLinhas deixadas como estavam (já lançadas): %2\nLinhas rejeitadas: %3")
+        .arg(posted)
+        .arg(lines - posted - rejected)
+        .arg(rejected);
+}
 
 RejectsListing setRejectsListing(RejectsListing listing)
 {
@@ -312,11 +326,13 @@ ImportSummary ProcessarImportacao(int month, int year, int tipo)
     Recordset rejects;
     rejects.openInMemory(rejectColumns());
     if (movements.eof()) {
+        // Nothing to post against: the month was never generated. The
+        // progress window goes first, so that the message is not behind it.
+        progress.release();
         summary.refusal = QStringLiteral("Não foram processados os registos de quotas referente a %1 / %2.").arg(month).arg(year);
-        msgBox(summary.refusal);
+        msgBox(summary.refusal + QStringLiteral("\n\nGere primeiro as quotas de %1 de %2 (\"Gerar Quotas\").").arg(monthNames().value(month - 1, QString::number(month))).arg(year));
     } else {
-        Lines lines{source, movements, accounts, connection, quotaColumn,
-                    rend1Column, shared().SemSeparadorDecimal, month, year, tipo};
+        Lines lines{source, movements, accounts, connection, quotaColumn, rend1Column, shared().SemSeparadorDecimal, month, year, tipo, {}};
         LazyCommits lazy(connection);
         while (!source.eof()) {
             ++summary.lines;
@@ -336,14 +352,19 @@ ImportSummary ProcessarImportacao(int month, int year, int tipo)
                                       .arg(summary.lines + 1)
                                       .arg(e.message())
                                       .arg(summary.posted));
+            } catch (const ConcurrencyError&) {
+                ++summary.failed;
+                lines.reason = QStringLiteral("alterado por outro utilizador");
+                lines.resynchronise();
             } catch (const QuotasError&) {
                 ++summary.failed;
+                lines.reason = QStringLiteral("não gravado");
                 lines.resynchronise();
             }
             if (outcome == Outcome::Posted)
                 ++summary.posted;
             else if (outcome == Outcome::Rejected)
-                copyToRejects(rejects, source);
+                copyToRejects(rejects, source, lines.reason);
             progress.call("setvalor", {1});
             source.moveNext();
         }
@@ -363,6 +384,9 @@ ImportSummary ProcessarImportacao(int month, int year, int tipo)
            Buttons::Ok, Icon::Critical);
     try {
         rewriteExtras(connection, rejects);
+        shared().rejectReasons.clear();
+        for (rejects.moveFirst(); !rejects.eof(); rejects.moveNext())
+            shared().rejectReasons << rejects.value(kRejectColumns).toString();
     } catch (const QuotasError& e) {
         summary.extrasSaved = false;
         msgBox(QStringLiteral("Não foi possível gravar os registos não importados na tabela extras, que ficou como "

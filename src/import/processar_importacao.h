@@ -16,6 +16,10 @@ struct ImportSummary {
     // Why no line was gone through (no lines, no no_tap or quota column, no
     // dues charged, the dues unreadable), as the run told it; empty otherwise.
     QString refusal;
+
+    // Lines posted, left alone (posted before) and rejected, one per line,
+    // for the dialog's closing message.
+    QString counts() const;
 };
 
 // Posts the employer's list of deductions, obtained from the import source

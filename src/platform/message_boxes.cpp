@@ -4,6 +4,7 @@
 #include <QInputDialog>
 #include <QMessageBox>
 #include <QPushButton>
+#include <utility>
 
 namespace quotas {
 
@@ -68,11 +69,16 @@ Answer QtMessageBoxes::message(const QString& text, Buttons buttons, Icon icon, 
     case Buttons::YesNoCancel: box.setStandardButtons(QMessageBox::Yes | QMessageBox::No | QMessageBox::Cancel); break;
     case Buttons::YesNoDefaultNo:
         box.setStandardButtons(QMessageBox::Yes | QMessageBox::No);
-        box.button(QMessageBox::Yes)->setText(QStringLiteral("Sim"));
-        box.button(QMessageBox::No)->setText(QStringLiteral("Não"));
         box.setDefaultButton(QMessageBox::No);
         box.setEscapeButton(QMessageBox::No);
         break;
+    }
+    // Our own Portuguese, whatever translation of Qt is loaded.
+    const std::pair<QMessageBox::StandardButton, const char*> texts[] = {
+        {QMessageBox::Yes, "&Sim"}, {QMessageBox::No, "&Não"}, {QMessageBox::Cancel, "Cancelar"}, {QMessageBox::Ok, "OK"}};
+    for (const auto& [button, text] : texts) {
+        if (QAbstractButton* b = box.button(button))
+            b->setText(QString::fromUtf8(text));
     }
     switch (box.exec()) {
     case QMessageBox::Yes: return Answer::Yes;
@@ -84,11 +90,15 @@ Answer QtMessageBoxes::message(const QString& text, Buttons buttons, Icon icon, 
 
 std::optional<QString> QtMessageBoxes::input(const QString& prompt, const QString& title, const QString& defaultText)
 {
-    bool ok = false;
-    const QString text = QInputDialog::getText(owner(), title, prompt, QLineEdit::Normal, defaultText, &ok);
-    if (!ok)
+    QInputDialog dialog(owner());
+    dialog.setWindowTitle(title);
+    dialog.setLabelText(prompt);
+    dialog.setTextValue(defaultText);
+    dialog.setOkButtonText(QStringLiteral("OK"));
+    dialog.setCancelButtonText(QStringLiteral("Cancelar"));
+    if (dialog.exec() != QDialog::Accepted)
         return std::nullopt;
-    return text;
+    return dialog.textValue();
 }
 
 }  // namespace quotas

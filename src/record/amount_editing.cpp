@@ -11,6 +11,7 @@
 #include "record/record_text.h"
 
 #include <QFocusEvent>
+#include <QKeyEvent>
 #include <QLineEdit>
 
 namespace quotas {
@@ -44,6 +45,15 @@ bool FrmQuota::isAmountField(const QObject* object) const
 bool FrmQuota::eventFilter(QObject* watched, QEvent* event)
 {
     const QEvent::Type type = event->type();
+    if (type == QEvent::KeyPress && isAmountField(watched)) {
+        // Enter goes on to the next field, so that the due is recomputed as
+        // leaving the field recomputes it.
+        const int key = static_cast<QKeyEvent*>(event)->key();
+        if (key == Qt::Key_Return || key == Qt::Key_Enter) {
+            focusNextChild();
+            return true;
+        }
+    }
     if (!isAmountField(watched) || (type != QEvent::FocusIn && type != QEvent::FocusOut) || !Adodc1 || m_unloaded)
         return QDialog::eventFilter(watched, event);
     auto* field = static_cast<QLineEdit*>(watched);

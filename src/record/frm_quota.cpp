@@ -9,6 +9,7 @@
 #include "record/movement_saving.h"
 #include "record/record_text.h"
 
+#include <QCloseEvent>
 #include <QKeyEvent>
 #include <QLineEdit>
 #include <QPushButton>
@@ -50,7 +51,7 @@ void FrmQuota::load()
     Text13->clear();
     // The computed fields are filled once the window is up and positioned.
     Timer1->start(1);
-    Text1->setFocus();
+    Text5->setFocus();  // the first field that takes typing
 }
 
 void FrmQuota::setOwner(General* owner)
@@ -198,6 +199,30 @@ void FrmQuota::unload()
     } catch (...) {
         // What the host does with the key, and how it fails, is its own affair.
     }
+}
+
+bool FrmQuota::hasUnsavedEdits() const
+{
+    if (!Adodc1 || m_unloaded)
+        return false;
+    if (Adodc1->editing())
+        return true;
+    const auto* field = qobject_cast<const QLineEdit*>(focusWidget());
+    return isAmountField(field) && m_textOnEnter.contains(field) && field->text() != m_textOnEnter.value(field);
+}
+
+void FrmQuota::closeEvent(QCloseEvent* event)
+{
+    // The close control never saves; typed values are only dropped once the
+    // user says so.
+    if (hasUnsavedEdits()
+        && msgBox(QStringLiteral("As alterações a esta quota não foram gravadas.\nQuer fechar a janela sem as gravar?"),
+                  Buttons::YesNoDefaultNo, Icon::Question, windowTitle())
+               != Answer::Yes) {
+        event->ignore();
+        return;
+    }
+    QDialog::closeEvent(event);
 }
 
 void FrmQuota::keyPressEvent(QKeyEvent* event)

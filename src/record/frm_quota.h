@@ -79,9 +79,12 @@ public slots:
 protected:
     bool eventFilter(QObject* watched, QEvent* event) override;
     void keyPressEvent(QKeyEvent* event) override;
+    void closeEvent(QCloseEvent* event) override;
 
 private:
     void buildControls();
+    // Typed values not saved: in the row, or in the field being edited.
+    bool hasUnsavedEdits() const;
     void load();
 
     void Timer1_Timer();

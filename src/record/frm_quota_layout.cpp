@@ -5,6 +5,7 @@
 #include <QHBoxLayout>
 #include <QLabel>
 #include <QLineEdit>
+#include <QPalette>
 #include <QPushButton>
 #include <QVBoxLayout>
 
@@ -17,6 +18,14 @@ QLineEdit* field(QWidget* parent, const char* name, bool editable, bool number)
     auto* edit = new QLineEdit(parent);
     edit->setObjectName(QLatin1String(name));
     edit->setReadOnly(!editable);
+    if (!editable) {
+        // Drawn on the window's own colour, so that it does not look typed
+        // into, and out of the Tab order; a click still selects its text.
+        QPalette palette = edit->palette();
+        palette.setColor(QPalette::Base, palette.color(QPalette::Window));
+        edit->setPalette(palette);
+        edit->setFocusPolicy(Qt::ClickFocus);
+    }
     if (number)
         edit->setAlignment(Qt::AlignRight | Qt::AlignVCenter);
     return edit;
@@ -108,9 +117,8 @@ void FrmQuota::buildControls()
     whole->addLayout(groups);
     whole->addLayout(buttons);
 
-    // The fields in the order of the groups, then the buttons.
-    QWidget* order[] = {Text1, Text2, Text3, Text4, Text7, Text5, Text6, Text8, Text9, Text13,
-                        Text10, Text12, Text11, Command1, Command2, Command3};
+    // The fields that take typing, then the buttons.
+    QWidget* order[] = {Text5, Text6, Text8, Command1, Command2, Command3};
     for (size_t i = 1; i < std::size(order); ++i)
         setTabOrder(order[i - 1], order[i]);
     resize(600, 370);

@@ -6,6 +6,7 @@
 #include "record/frm_quota.h"
 
 #include "component/money.h"
+#include "component/month_names.h"
 #include "platform/errors.h"
 #include "platform/message_boxes.h"
 #include "platform/recordset.h"
@@ -91,7 +92,14 @@ void FrmQuota::Command1_Click()
 {
     if (!validateActiveField())
         return;
-    if (msgBox(QStringLiteral("Quer eliminar este registo?"), Buttons::YesNo, Icon::Question,
+    // The second line names the movement, so that no one deletes another by
+    // mistake; Enter answers No.
+    const int mes = Adodc1->value(QStringLiteral("mes")).toInt();
+    const QString movement = QStringLiteral("%1, %2 de %3, %4")
+                                 .arg(Adodc1->value(QStringLiteral("ref")).toString(), monthNames().value(mes - 1, QString::number(mes)),
+                                      Adodc1->value(QStringLiteral("ano")).toString(),
+                                      formatMoney(amountOf(Adodc1->value(QStringLiteral("quota")))));
+    if (msgBox(QStringLiteral("Quer eliminar este registo?\n") + movement, Buttons::YesNoDefaultNo, Icon::Question,
                QStringLiteral("Quotizações"))
         != Answer::Yes)
         return;

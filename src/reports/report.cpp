@@ -40,7 +40,8 @@ void Report::setObserver(std::function<void(const ReportDocument&)> o)
 
 ReportDocument Report::run(const QDate& printed)
 {
-    return layOutObservedReport(m_layout, Data().command(m_layout->command).execute(), printed);
+    Recordset& read = Data().command(m_layout->command).execute();
+    return layOutObservedReport(m_layout, m_layout->rows ? m_layout->rows(read) : read, printed);
 }
 
 void Report::showPreview(QWidget* parent)

@@ -1,10 +1,14 @@
 #pragma once
 
+#include <functional>
+
 #include <QColor>
 #include <QString>
 #include <vector>
 
 namespace quotas {
+
+class Recordset;
 
 // A report described as data: bands of fixed height holding labels, fields,
 // lines, filled rectangles and the count and sum functions, with every
@@ -68,6 +72,9 @@ struct ReportLayout {
     QString name;     // prtListagemDividas, ...
     QString title;    // the preview window's and the PDF's title
     QString command;  // the named command of Data whose rows feed the detail band
+    // When set, the rows the report shows, made from the command's: for
+    // what is known beside the table's rows but not stored in them.
+    std::function<Recordset&(Recordset& read)> rows;
     int width = 10575;
     ReportBand reportHeader;
     ReportBand pageHeader;

@@ -30,7 +30,9 @@ namespace {
 
 const QVariant kNull = QVariant(QMetaType::fromType<double>());
 const QString kConfirm = QStringLiteral("Question YesNo [Processar Quotizações] Deseja iniciar o processamento de quotas?");
-const QString kEnd = QStringLiteral("Information Ok [Gerar Quotas] Fim do processamento de quotizações");
+// The closing message with the members processed, the dues posted and those left out.
+const QString kEnd = QStringLiteral("Information Ok [Gerar Quotas] Fim do processamento de quotizações\n\nAssociados "
+                                    "processados: %1\nQuotas lançadas: %2\nQuotas não lançadas: %3");
 const QString kProgress = QStringLiteral("Criando registos de quotas, aguarde alguns momentos . . ., Processamento de Quotas)");
 
 // The boxes shown, as "icon buttons [title] text".
@@ -351,12 +353,12 @@ private slots:
     void dialogRunsTheChoices_data()
     {
         QTest::addColumn<Choices>("c");
-        const QStringList missing{kConfirm, kEnd,
+        const QStringList missing{kConfirm, kEnd.arg(3).arg(2).arg(1),
                                   "Exclamation Ok [Gerar Quotas] Não foi gerada 1 quota:\n- 1 quota porque a conta do "
                                   "associado não tem a remuneração 1 ou a remuneração 2 (Nº Empresa: 1002);\nCorrija estes "
                                   "valores e volte a gerar o mesmo mês: as quotas já geradas não se repetem."};
         QTest::newRow("March 2001, every member") << Choices{2001, 3, {}, true, missing, {"1|1|37.5", "3|1|37.5"}};
-        QTest::newRow("one member by staff number") << Choices{2003, 1, {"1003"}, true, {kConfirm, kEnd}, {"3|1|37.5"}};
+        QTest::newRow("one member by staff number") << Choices{2003, 1, {"1003"}, true, {kConfirm, kEnd.arg(1).arg(1).arg(0)}, {"3|1|37.5"}};
         QTest::newRow("a number typed, then cleared") << Choices{2003, 1, {"1003", ""}, true, missing, {"1|1|37.5", "3|1|37.5"}};
         QTest::newRow("No leaves every choice") << Choices{2001, 3, {"1003"}, false, {kConfirm}, {}};
     }

@@ -234,7 +234,8 @@ private slots:
         QTest::newRow("cancelled") << QByteArray("cancelled") << 3 << QStringList{};
         QTest::newRow("nothing charged in May")
             << QByteArray("no_tap;quota\n100;8.00\n999;1\n") << 5
-            << QStringList{"None: Não foram processados os registos de quotas referente a 5 / 2004."};
+            << QStringList{"None: Não foram processados os registos de quotas referente a 5 / 2004.\n\n"
+                           "Gere primeiro as quotas de Maio de 2004 (\"Gerar Quotas\")."};
     }
     void refusesWhatCannotBeImported()
     {
@@ -345,6 +346,9 @@ private slots:
         QCOMPARE(rows("SELECT Field0, Field1, Field2, Field3, Field20 FROM extras ORDER BY extra_id"),
                  QStringList({"999|7.00|João|x|-", "200|abc|Rui|y|-", "300|6.00|Sem conta|z|-",
                               "400||Vazio|-|-", "998|1|a|b|20"}));
+        // Each line's reason, beside extras, for the listing.
+        QCOMPARE(shared().rejectReasons, QStringList({"sem quota gerada", "valor ilegível", "sem conta", "valor ilegível",
+                                                      "sem quota gerada"}));
         QCOMPARE(rows("SELECT socio_id, pago FROM tbQuotas_Movimentos ORDER BY 1"), QStringList({"1|8", "2|0", "3|0", "4|0"}));
         // The listing comes after extras was rewritten, on an open SqlServer_Prints, closed after.
         QCOMPARE(listings, QStringList{"5|1"});
@@ -396,6 +400,7 @@ private slots:
         QCOMPARE(QList<int>({summary.posted, summary.failed}), QList<int>({3, 1}));
         QCOMPARE(told(boxes), QStringList{kRejected.arg(1)});
         QCOMPARE(rows("SELECT Field0, Field1 FROM extras"), QStringList{"200|8.00"});
+        QCOMPARE(shared().rejectReasons, QStringList{"alterado por outro utilizador"});
         QCOMPARE(rows("SELECT m.socio_id, m.pago, a.total_quotas, a.total_pago FROM tbQuotas_Movimentos m JOIN tbQuotas_Socios a "
                       "ON a.socio_id = m.socio_id ORDER BY m.socio_id"),
                  QStringList({"1|8|8|13", "2|9|9|9", "3|7|7|7"}));
@@ -469,7 +474,8 @@ private slots:
         const CliRun none = importar(march, useFile("no_tap;quota\n100;800\n"));
         QVERIFY2(none.status == 0 && !QFile::exists(pdf) && none.out.contains(pdf), qPrintable(none.out + none.err));
         const CliRun notCharged = importar({"--ano", "2004", "--mes", "7", "--tipo", "2"});
-        QCOMPARE(notCharged.out, QStringLiteral("Não foram processados os registos de quotas referente a 7 / 2004.\n"));
+        QCOMPARE(notCharged.out, QStringLiteral("Não foram processados os registos de quotas referente a 7 / 2004. "
+                                                "Gere primeiro as quotas de Julho de 2004 (\"Gerar Quotas\").\n"));
         const std::pair<CliRun, QString> refusals[] = {{notCharged, "referente a 7 / 2004"},
                                                        {importar(march, useFile("no_tap;valor\n100;800\n")), "campos no_tap ou quota"},
                                                        {importar(march, useFile("no_tap;quota\n")), "registos para importar"},
@@ -500,12 +506,15 @@ private slots:
     void dialogRunsOnTheSelectionAndCloses_data()
     {
         QTest::addColumn<Selection>("s");
-        const QString none = QStringLiteral("None: Não foram processados os registos de quotas referente a %1.");
-        QTest::newRow("February 2003") << Selection{"2003", "Fevereiro", "Plano de Saúde", "5.00", none.arg("2 / 2003")};
-        QTest::newRow("month name in other case: 0") << Selection{"2004", "março", "Plano de Saúde", "5.00", none.arg("0 / 2004")};
-        QTest::newRow("union due, March 2004") << Selection{"2004", "Março", "Sindicato", "5.00", none.arg("3 / 2004")};
-        QTest::newRow("health plan, March 2004") << Selection{"2004", "Março", "Plano de Saúde", "5.00", "", "5"};
-        QTest::newRow("whole cents") << Selection{"2004", "Março", "Plano de Saúde", "500", "", "5"};
+        const QString none = QStringLiteral("None: Não foram processados os registos de quotas referente a %1 / %3.\n\n"
+                                            "Gere primeiro as quotas de %2 de %3 (\"Gerar Quotas\").");
+        QTest::newRow("February 2003") << Selection{"2003", "Fevereiro", "Plano de Saúde", "5.00", none.arg("2", "Fevereiro", "2003")};
+        QTest::newRow("month name in other case: 0") << Selection{"2004", "março", "Plano de Saúde", "5.00", none.arg("0", "0", "2004")};
+        QTest::newRow("union due, March 2004") << Selection{"2004", "Março", "Sindicato", "5.00", none.arg("3", "Março", "2004")};
+        const QString posted = QStringLiteral("Information: Fim da importação de quotas.\n\nLinhas lançadas: 1\n"
+                                              "Linhas deixadas como estavam (já lançadas): 0\nLinhas rejeitadas: 0");
+        QTest::newRow("health plan, March 2004") << Selection{"2004", "Março", "Plano de Saúde", "5.00", posted, "5"};
+        QTest::newRow("whole cents") << Selection{"2004", "Março", "Plano de Saúde", "500", posted, "5"};
         QTest::newRow("a file that cannot be read")
             << Selection{"2004", "Março", "Plano de Saúde", "\"5.00",
                          "Critical: O ficheiro \"<file>\" não é um ficheiro CSV válido: um valor entre aspas começado na linha 2 "

@@ -19,6 +19,7 @@
 #include <QPointer>
 #include <QPushButton>
 #include <QSqlQuery>
+#include <QTableView>
 #include <QTableWidget>
 #include <QTest>
 #include <QTimer>
@@ -58,7 +59,7 @@ const QString belowPaid = u"Quotas (information) Este valor não é válido porq
 const QString amountBox = u"Pagamento [10] Digite a importância a liquidar."_s;
 const QString documentBox = u"Tipo de Documento [] Indique o documento comprovativo de pagamento da quota:"_s;
 const QString overBox = u"Pagamento (question, yes/no) A importância de € %1 é superior ao valor por liquidar (€ 10.00)."_s;
-const QString question = u"Quotizações (question, yes/no) Quer eliminar este registo?"_s;
+const QString question = u"Quotizações (question, yes/NO) Quer eliminar este registo? / Sindicato, Março de 2003, € %1"_s;
 const QString lastValues = u"ult_ano=%1; ult_mes=%2; ult_rend1=700; ult_rend2=300.1; ult_quota_sindicato=%3; ult_perc_sindicato=%4; "
                            "ult_quota_seguro=%5; ult_perc_seguro=%6; total_quotas=%7; total_pago=%8"_s;
 
@@ -174,7 +175,7 @@ class RecordWindowTest : public QObject {
             QVERIFY(QTest::qWaitForWindowActive(frm));
             script(*frm);
             if (frm && frm->isVisible())
-                frm->close();
+                frm->done(QDialog::Rejected);  // as the close control, without its question
         });
         poll.start(2);
         opener();
@@ -202,9 +203,13 @@ class RecordWindowTest : public QObject {
         const char* icons[] = {"", "critical", "question", "exclamation", "information"};
         QStringList out;
         for (const ShownBox& b : boxes.shown) {
+            const bool noFirst = b.buttons == Buttons::YesNoDefaultNo;  // such a question is shown whole
             const QString mark = b.isInput ? u'[' + b.defaultText + u']'
-                                           : u"(%1%2)"_s.arg(QLatin1String(icons[int(b.icon)]), b.buttons == Buttons::YesNo ? ", yes/no"_L1 : ""_L1);
-            out << u"%1 %2 %3%4"_s.arg(b.title, mark, b.text.section(u'\n', 0, 0), b.text.contains(u"outro utilizador"_s) ? u" (another user)"_s : QString());
+                                           : u"(%1%2)"_s.arg(QLatin1String(icons[int(b.icon)]), b.buttons == Buttons::YesNo ? ", yes/no"_L1
+                                                                                                : noFirst                   ? ", yes/NO"_L1
+                                                                                                                            : ""_L1);
+            const QString text = noFirst ? QString(b.text).replace(u'\n', u" / "_s) : b.text.section(u'\n', 0, 0);
+            out << u"%1 %2 %3%4"_s.arg(b.title, mark, text, b.text.contains(u"outro utilizador"_s) ? u" (another user)"_s : QString());
         }
         return out;
     }
@@ -232,14 +237,18 @@ private slots:
         const MovementRow paid15{100.0, 200.0, 3.0, 15.0}, quarter{40.0, 0.0, 10.0, 12.0}, one{1.0, 0.0, 0.25, 0.0};
         const MovementRow portuguese{1234.5, 0.0, 18.52, 30.0, u"Seguro"_s, 2004, 12};
         const auto row = [](const char* tag, const Edit& e) { QTest::newRow(tag) << e; };
-        row("part paid", {{600.0, 200.0, 10.0, 4.0}, "", "", {}, 10.0, {"€ 600.00", "0.0125", "€ 6.00"}});
-        row("overpaid", {{800.0, 0.0, 10.0, 12.5}, "", "", {}, 10.0, {"€ 800.00", "0.0125", "(€ 2.50)"}});
-        row("no remunerations", {{0.0, 0.0, 10.0, 0.0}, "", "", {}, 10.0, {"€ 0.00", "0", "€ 10.00"}});
-        row("5 places, tie down", {{400.0, 0.0, 0.05, 0.0}, "", "", {}, 0.05, {"€ 400.00", "0.00012", "€ 0.05"}});
-        row("5 places, tie up", {{400.0, 0.0, 0.15, 0.0}, "", "", {}, 0.15, {"€ 400.00", "0.00038", "€ 0.15"}});
-        row("grouped", {{1234567.0, 0.0, 1234567.0, 0.01}, "", "", {}, 1234567.0, {"€ 1,234,567.00", "1", "€ 1,234,566.99"}});
-        row("in the user's notation", {portuguese, "", "", {}, 18.52, {"€ 1\u00a0234,50", "0,015", "(€ 11,48)"}, "pt_PT"});
+        // The window opens in "Remuneração (1):", its number ready for typing.
+        row("part paid", {{600.0, 200.0, 10.0, 4.0}, "", "", {}, 10.0, {"600", "0.0125", "€ 6.00"}});
+        row("overpaid", {{800.0, 0.0, 10.0, 12.5}, "", "", {}, 10.0, {"800", "0.0125", "(€ 2.50)"}});
+        row("no remunerations", {{0.0, 0.0, 10.0, 0.0}, "", "", {}, 10.0, {"0", "0", "€ 10.00"}});
+        row("5 places, tie down", {{400.0, 0.0, 0.05, 0.0}, "", "", {}, 0.05, {"400", "0.00012", "€ 0.05"}});
+        row("5 places, tie up", {{400.0, 0.0, 0.15, 0.0}, "", "", {}, 0.15, {"400", "0.00038", "€ 0.15"}});
+        row("grouped", {{1234567.0, 0.0, 1234567.0, 0.01}, "", "", {}, 1234567.0, {"1234567", "1", "€ 1,234,566.99"}});
+        row("in the user's notation", {portuguese, "", "", {}, 18.52, {"1234,5", "0,015", "(€ 11,48)"}, "pt_PT"});
         row("typed in the user's notation", {portuguese, "Text5", "2000,5", {}, 30.01, {"€ 2\u00a0000,50", "0,015", "€ 0,01"}, "pt_PT"});
+        // Either notation, whatever the desktop's language.
+        row("comma on an English desktop", {portuguese, "Text5", "2.000,5", {}, 30.01, {"€ 2,000.50", "0.015", "€ 0.01"}, "en_US"});
+        row("point on a Portuguese desktop", {portuguese, "Text5", "2000.5", {}, 30.01, {"€ 2\u00a0000,50", "0,015", "€ 0,01"}, "pt_PT"});
         row("empty", {base, "Text5", "", invalid, 3.0, {"", "0.01", "€ 3.00"}});
         row("not a number", {base, "Text5", "12x", invalid, 3.0, {"12x", "0.01", "€ 3.00"}});
         row("recomputed", {base, "Text5", "1000", {}, 12.0, {"€ 1,000.00", "0.01", "€ 12.00"}});
@@ -310,7 +319,10 @@ private slots:
         row("Sair, another letter case is insurance", {"Command3", otherCase, true, "700", {}, {}, {}, true, saved, intoInsurance});
         row("Sair without remunerations writes rate 0", {"Command3", {0.0, 0.0, 7.5, 0.0}, false, "0", {}, {}, {}, true, u"quota=0"_s, u"ult_quota_sindicato=0; ult_perc_sindicato=0"_s});
         row("Sair first validates the field", {"Command3", {}, false, "abc", {}, {}, {invalid}, false, u"rend1=1000"_s, u"none"_s});
-        row("the close control saves nothing", {"close", {100.0, 200.0, 3.0, 0.0}, false, "1000", {}, {}, {}, true, u"rend1=100; quota=3"_s, u"none"_s});
+        // Typed values unsaved: the close control asks first, and saves nothing either way.
+        const QStringList unsaved = {u"Quota (question, yes/NO) As alterações a esta quota não foram gravadas. / Quer fechar a janela sem as gravar?"_s};
+        row("the close control saves nothing", {"close", {100.0, 200.0, 3.0, 0.0}, false, "1000", {}, Answer::Yes, unsaved, true, u"rend1=100; quota=3"_s, u"none"_s});
+        row("the close control, not confirmed", {"close", {100.0, 200.0, 3.0, 0.0}, false, "1000", {}, Answer::No, unsaved, false, u"rend1=100; quota=3"_s, u"none"_s});
 
         const MovementRow due{1000.0, 0.0, 10.0, 0.0};
         const QStringList asked = {amountBox, documentBox};
@@ -333,8 +345,8 @@ private slots:
 
         const MovementRow paid4{1000.0, 0.0, 10.0, 4.0};
         const QString untouched = u"ult_rend1=1; total_quotas=50; total_pago=20"_s;
-        row("cancellation, yes", {"Command1", paid4, true, "2000", {}, Answer::Yes, {question}, true, u"none"_s, untouched});
-        row("cancellation, no", {"Command1", paid4, true, "2000", {}, Answer::No, {question}, false, u"rend1=1000; pago=4"_s, untouched});
+        row("cancellation, yes", {"Command1", paid4, true, "2000", {}, Answer::Yes, {question.arg(u"20.00"_s)}, true, u"none"_s, untouched});
+        row("cancellation, no", {"Command1", paid4, true, "2000", {}, Answer::No, {question.arg(u"20.00"_s)}, false, u"rend1=1000; pago=4"_s, untouched});
 
         // Another user's work is never overwritten: a refused save step leaves the account as it was; the payment's own save
         // step, before its refusal, is final. Once the database is back, the window saves.
@@ -344,10 +356,10 @@ private slots:
         const QStringList payA = {u"4"_s, u"A"_s};
         row("Sair after another user's payment", {"Command3", due, true, "1200", {}, {}, {notSaved + another}, false, paidByB, u"ult_rend1=1; total_pago=26"_s, "another user"});
         row("payment after another user's", {"Command2", due, true, "", payA, {}, {amountBox, documentBox, notPaid + another}, false, paidByB, u"ult_rend1=1; total_pago=26"_s, "another user"});
-        row("cancellation after another user's", {"Command1", due, true, "", {}, Answer::Yes, {question, notDeleted + another}, false, paidByB, u"ult_rend1=1; total_pago=26"_s, "another user"});
+        row("cancellation after another user's", {"Command1", due, true, "", {}, Answer::Yes, {question.arg(u"10.00"_s), notDeleted + another}, false, paidByB, u"ult_rend1=1; total_pago=26"_s, "another user"});
         row("Sair, database down", {"Command3", due, true, "1200", {}, {}, {notSaved}, false, u"rend1=1200; pago=0"_s, u"ult_rend1=1200; total_pago=20"_s, "database down"});
         row("payment, database down", {"Command2", due, true, "", payA, {}, {amountBox, documentBox, notPaid}, false, u"rend1=1000; pago=0; doc_no=null"_s, u"ult_rend1=1; total_pago=20"_s, "database down"});
-        row("cancellation, database down", {"Command1", due, true, "", {}, Answer::Yes, {question, notDeleted}, false, u"rend1=1000; pago=0"_s, u"ult_rend1=1; total_pago=20"_s, "database down"});
+        row("cancellation, database down", {"Command1", due, true, "", {}, Answer::Yes, {question.arg(u"10.00"_s), notDeleted}, false, u"rend1=1000; pago=0"_s, u"ult_rend1=1; total_pago=20"_s, "database down"});
         // Paid from elsewhere, a member without an account gets none.
         row("another user pays, no account", {"close", due, false, "", {}, {}, {}, true, u"pago=6; doc_no=B"_s, u"none"_s, "another user"});
         // Regression: a window that changed nothing put its stale values back into the account.
@@ -372,7 +384,7 @@ private slots:
             boxes.answerInput(text.isNull() ? std::nullopt : std::optional(text));
         boxes.answer(e.answer);
         boxes.onShow = [&](const ShownBox& box) {
-            if (down && (box.title == "Tipo de Documento"_L1 || box.buttons == Buttons::YesNo))
+            if (down && (box.title == "Tipo de Documento"_L1 || box.buttons == Buttons::YesNo || box.buttons == Buttons::YesNoDefaultNo))
                 connection.close();
         };
         RecordingCaller recording;
@@ -449,9 +461,9 @@ private slots:
         window.show();
         QVERIFY(QTest::qWaitForWindowExposed(&window));
         QTableWidget* movements = window.movements();
-        window.members()->setCurrentCell(1, 1);  // T2
+        window.selectMember(2);
         QCOMPARE(movements->rowCount(), 1);
-        window.members()->setCurrentCell(0, 1);  // T1, its latest movement first
+        window.selectMember(1);  // its latest movement first
         QStringList latest;
         for (int column = 0; column < movements->columnCount(); ++column)
             latest << movements->item(0, column)->text();
@@ -467,8 +479,8 @@ private slots:
             QTest::mouseDClick(movements->viewport(), Qt::LeftButton, {}, older); }, [&](FrmQuota& frm) { click(frm.Command2); }));
         QCOMPARE(read(u"pago"_s, january), u"pago=4"_s);
         QCOMPARE(window.currentMovement(), january);  // selected again, both lists refreshed
-        QCOMPARE(movements->item(movements->currentRow(), 8)->text() + window.members()->item(window.members()->currentRow(), 3)->text(),
-                 u"€ 4.00€ 4.00"_s);
+        QCOMPARE(movements->item(movements->currentRow(), 8)->text() + window.members()->currentIndex().siblingAtColumn(4).data().toString(),
+                 u"€ 4.00€ 18.50"_s);  // paid, and the open amount of the movements
 
         // A key handed back is selected; a cancelled movement is gone from the list, with nothing selected.
         window.RemoteKey(february);

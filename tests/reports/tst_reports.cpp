@@ -332,17 +332,20 @@ private slots:
     }
 
     // Table extras as it stands: every line in the database's order, the
-    // first four columns, an empty first column counted and a Null one not.
+    // first four columns and the reasons the last import kept beside them,
+    // an empty first column counted and a Null one not.
     void listsTheRejectsAfreshAtEveryShowing()
     {
         reject({null, u"sem número"_s});
         reject({u""_s, u"vazio"_s});
         reject({u"300"_s, u"Rui"_s, u"12,50"_s});
         reject({u"100"_s, u"Ana"_s, u"c"_s, u"d"_s, u"quinta coluna"_s});
+        shared().rejectReasons = {u"sem conta"_s, u"valor ilegível"_s};  // known for the first two only
         const ReportDocument doc = show(u"rejects"_s);
+        shared().rejectReasons.clear();
         QCOMPARE(titles, QStringList{"Listagem de Dados não Importados para a Base de Dados"});
-        QCOMPARE(texts(doc, {u"Text2"_s, u"Text1"_s, u"Text3"_s, u"Text7"_s}) + texts(doc, {u"Function1"_s}),
-                 (QStringList{"|sem número||", "|vazio||", "300|Rui|12,50|", "100|Ana|c|d", "3"}));
+        QCOMPARE(texts(doc, {u"Text2"_s, u"Text1"_s, u"Text8"_s, u"Text3"_s, u"Text7"_s}) + texts(doc, {u"Function1"_s}),
+                 (QStringList{"|sem número|sem conta||", "|vazio|valor ilegível||", "300|Rui||12,50|", "100|Ana||c|d", "3"}));
         QVERIFY(!Data().Extras.recordset().isOpen());
         reject({u"200"_s, u"Eva"_s});
         QCOMPARE(texts(show(u"rejects"_s), {u"Text2"_s}).last(), u"200"_s);
@@ -361,7 +364,7 @@ private slots:
                                "Assunto: Regularização de Débitos\nna presente data, de ESC: %3\nA Direcção"_s;
         QTest::newRow("cartas") << "cartas" << QStringList{letter.arg("Ana Conceição", "4000-322 Porto", "12,50 Esc"), letter.arg("Joaquim Gonçalves", "1100-053 Lisboa", "1.300,25 Esc")};
         QTest::newRow("rejeitados") << "rejeitados" << QStringList{"Listagem de Dados não Importados para a Base de Dados\n"
-                                                                   "Campo 1 Campo 2 Campo 3 Campo 4\n999001 Linha Rejeitada 12,50 TAP"};
+                                                                   "Campo 1 Campo 2 Motivo Campo 3 Campo 4\n999001 Linha Rejeitada 12,50 TAP"};
     }
     void theCommandsWriteThePagesToPdf()
     {

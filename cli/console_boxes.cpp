@@ -24,8 +24,7 @@ Answer ConsoleBoxes::message(const QString& text, Buttons buttons, Icon, const Q
     printLine(text);
     switch (buttons) {
     case Buttons::YesNo:
-    case Buttons::YesNoCancel:
-    case Buttons::YesNoDefaultNo: return Answer::Yes;
+    case Buttons::YesNoCancel: return Answer::Yes;
     default: return Answer::Ok;
     }
 }

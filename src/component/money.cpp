@@ -8,8 +8,13 @@ namespace quotas {
 double roundHalfEven(double value, int decimals)
 {
     const double scale = std::pow(10.0, decimals);
+    const double scaled = value * scale;
+    // A value this large has no digits left at that place: scaling it would
+    // only overflow to infinity.
+    if (!std::isfinite(scaled))
+        return value;
     // nearbyint follows the default rounding mode: to nearest, ties to even.
-    return std::nearbyint(value * scale) / scale;
+    return std::nearbyint(scaled) / scale;
 }
 
 std::optional<double> parseDecimal(const QString& text)
@@ -58,17 +63,17 @@ namespace {
 
 QString grouped(double amount, QChar decimal, QChar group)
 {
-    const double cents = std::fabs(roundHalfEven(amount, 2));
-    const qint64 whole = qint64(cents);
-    const int fraction = int(std::llround((cents - double(whole)) * 100.0));
-    QString digits = QString::number(whole);
+    // The digits come from the decimal text, not from a whole number of
+    // cents: an amount beyond 64 bits of cents must still show.
+    const QString fixed = QString::number(std::fabs(roundHalfEven(amount, 2)), 'f', 2);
+    const QString digits = fixed.left(fixed.size() - 3);
     QString out;
     for (qsizetype i = 0; i < digits.size(); ++i) {
         if (i > 0 && (digits.size() - i) % 3 == 0)
             out += group;
         out += digits[i];
     }
-    return out + decimal + QStringLiteral("%1").arg(fraction, 2, 10, QLatin1Char('0'));
+    return out + decimal + fixed.right(2);
 }
 
 }  // namespace

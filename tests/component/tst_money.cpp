@@ -22,6 +22,7 @@ private slots:
         QTest::newRow("not a tie") << 0.126 << 2 << 0.13;
         QTest::newRow("large amount keeps cents") << 123456789.125 << 2 << 123456789.12;
         QTest::newRow("participation") << 0.0123456 << 5 << 0.01235;
+        QTest::newRow("too large to scale stays itself") << 1e308 << 2 << 1e308;
     }
     void roundsHalfToEven()
     {
@@ -84,6 +85,8 @@ private slots:
                                            << "€ 1.234,50";
         QTest::newRow("tiny negative is zero") << -0.004 << "C"
                                                << "€ 0.00";
+        QTest::newRow("beyond 64 bits of cents") << -1e20 << "C"
+                                                 << "(€ 100,000,000,000,000,000,000.00)";
     }
     void formatsMoney()
     {

@@ -1,5 +1,7 @@
 # The two commands of a fresh Debian 12 machine: `make run` and `make test`.
-.PHONY: build run test bench clean
+# `make check` adds what CI runs beside the tests: the sanitizer build with the
+# fuzz targets, clang-tidy and the layout check.
+.PHONY: build run test check check-sanitize check-tidy check-format bench clean
 
 build:
 	scripts/setup.sh
@@ -10,8 +12,19 @@ run:
 test:
 	scripts/test.sh
 
+check: check-format check-tidy check-sanitize
+
+check-sanitize:
+	scripts/check-sanitize.sh
+
+check-tidy:
+	scripts/check-tidy.sh
+
+check-format:
+	scripts/check-format.sh
+
 bench:
 	scripts/bench.sh
 
 clean:
-	rm -rf build build-rel
+	rm -rf build build-rel build-sanitize

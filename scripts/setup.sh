@@ -15,6 +15,8 @@ packages=(
   clang-format                                    # scripts/check-format.sh
   libpq-dev                                       # libpq's header: COPY when copying to a server
   qt6-translations-l10n                           # Qt's own texts in Portuguese (qtbase_pt_BR.qm)
+  clang-tidy                                      # scripts/check-tidy.sh
+  clang libclang-rt-dev llvm                      # the sanitizer build, libFuzzer, llvm-symbolizer
 )
 missing=()
 for p in "${packages[@]}"; do

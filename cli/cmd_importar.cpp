@@ -2,6 +2,7 @@
 #include "cli/options.h"
 #include "component/shared_objects.h"
 #include "import/csv_import_source.h"
+#include "import/dry_run_window.h"
 #include "import/processar_importacao.h"
 #include "import/rejects_listing.h"
 #include "platform/components.h"
@@ -12,6 +13,24 @@
 
 namespace quotas::cli {
 
+namespace {
+
+// The dry run: one tab-separated line per line of the list, then the
+// counts; the exit status is the one the import would end with.
+int simulate(int month, int year, int tipo)
+{
+    ImportVerdicts verdicts;
+    const ImportSummary summary = SimularImportacao(month, year, tipo, verdicts);
+    for (const ImportVerdict& verdict : verdicts.lines)
+        std::fputs((dryRunCells(verdict).join(u'\t') + u'\n').toUtf8().constData(), stdout);
+    if (!summary.refusal.isEmpty())
+        throw QuotasError(summary.refusal);
+    std::fputs((dryRunTotals(verdicts) + u'\n').toUtf8().constData(), stdout);
+    return summary.rejected > 0 ? kLeftOut : 0;
+}
+
+}  // namespace
+
 int importar(const QStringList& args)
 {
     const Options options(
@@ -20,7 +39,8 @@ int importar(const QStringList& args)
          {QStringLiteral("mes"), QStringLiteral("Mês das quotas (1 a 12)."), QStringLiteral("M")},
          {QStringLiteral("tipo"), QStringLiteral("1 Sindicato, 2 Plano de Saúde."), QStringLiteral("T")},
          {QStringLiteral("sem-separador"), QStringLiteral("Os valores são cêntimos, sem ponto decimal.")},
-         {QStringLiteral("pdf"), QStringLiteral("Escreve aqui a listagem dos registos não importados."), QStringLiteral("SAIDA")}},
+         {QStringLiteral("pdf"), QStringLiteral("Escreve aqui a listagem dos registos não importados."), QStringLiteral("SAIDA")},
+         {QStringLiteral("simular"), QStringLiteral("Não grava nada: diz, linha a linha, o que a importação faria.")}},
         args, 1);
     const int year = options.number(QStringLiteral("ano"), 1000, 9999);
     const int month = options.number(QStringLiteral("mes"), 1, 12);
@@ -29,13 +49,15 @@ int importar(const QStringList& args)
     const QString pdf = options.isSet(QStringLiteral("pdf")) ? QFileInfo(options.value(QStringLiteral("pdf"))).absoluteFilePath()
                                                              : QString();
     connectOrFail();
-    // OUT always tells of this run: a listing left by an earlier one goes first.
-    if (!pdf.isEmpty() && QFileInfo::exists(pdf) && !QFile::remove(pdf))
-        throw QuotasError(QStringLiteral("não foi possível apagar a listagem anterior em %1.").arg(pdf));
 
     shared().SemSeparadorDecimal = options.isSet(QStringLiteral("sem-separador"));
     registerComponent(QStringLiteral("Dorvanta.General"),
                       [file] { return std::make_unique<CsvImportSource>(CsvImportSource::fixedFile(file)); });
+    if (options.isSet(QStringLiteral("simular")))
+        return simulate(month, year, tipo);
+    // OUT always tells of this run: a listing left by an earlier one goes first.
+    if (!pdf.isEmpty() && QFileInfo::exists(pdf) && !QFile::remove(pdf))
+        throw QuotasError(QStringLiteral("não foi possível apagar a listagem anterior em %1.").arg(pdf));
     // Headless there is no preview: the listing goes to the PDF when one was
     // asked for, and is otherwise left in extras for "quotas rejeitados".
     QString listingFailure;

@@ -27,7 +27,7 @@ const char* const kUsage =
     "  login [--print-connection-string]\n"
     "  gerar --ano A --mes M [--no-tap N]\n"
     "  anular-geracao --ano A --mes M [--tipo 1|2] [--no-tap N] [--confirmar]\n"
-    "  importar --ano A --mes M --tipo 1|2 [--sem-separador] [--pdf SAIDA] FICHEIRO\n"
+    "  importar --ano A --mes M --tipo 1|2 [--sem-separador] [--pdf SAIDA | --simular] FICHEIRO\n"
     "  manutencao\n"
     "  copiar --data-source HOST[,PORTA] --catalog BD --user U --password P\n"
     "  listagem --pdf SAIDA | cartas --pdf SAIDA | rejeitados --pdf SAIDA\n"

@@ -46,6 +46,7 @@ const Entry kEntries[] = {
     {nullptr, nullptr, {}},
     {"ExtratoQuotas", "&Extrato de Quotas", {}},
     {"ResumoMes", "Res&umo do Mês", {}},
+    {"SimularImportacao", "Simular Im&portação", {}},
     {"AnularGeracao", "&Anular Geração", {}},
     {"Login", "Ligar à &Base de Dados", {}},
 };

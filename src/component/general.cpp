@@ -82,4 +82,9 @@ void General::ResumoMes()
     showMonthSummaryDialog();
 }
 
+void General::SimularImportacao()
+{
+    showDryRunDialog();
+}
+
 }  // namespace quotas

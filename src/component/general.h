@@ -48,6 +48,9 @@ public:
     // The month's reconciliation summary: the dialog that chooses the year
     // and month and previews it, modal.
     Q_INVOKABLE void ResumoMes();
+    // The import's dry run: the import dialog's choices, then what the
+    // import would do with every line of the list, writing nothing; modal.
+    Q_INVOKABLE void SimularImportacao();
 };
 
 }  // namespace quotas

@@ -4,6 +4,7 @@
 #include "import/frm_importar_quotas.h"
 
 #include <QApplication>
+#include <QPointer>
 #include <QScreen>
 
 namespace quotas {
@@ -26,6 +27,13 @@ void showImportDialog()
     else
         dialog->show();
     dialog->activateWindow();
+}
+
+void showDryRunDialog()
+{
+    QPointer<FrmImportarQuotas> dialog = new FrmImportarQuotas(QApplication::activeWindow(), FrmImportarQuotas::Mode::DryRun);
+    dialog->exec();
+    delete dialog.data();  // closed, it deletes itself later; once is enough
 }
 
 }  // namespace quotas

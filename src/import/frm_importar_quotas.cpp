@@ -3,6 +3,7 @@
 #include "component/month_names.h"
 
 #include "component/shared_objects.h"
+#include "import/dry_run_window.h"
 #include "import/processar_importacao.h"
 #include "platform/errors.h"
 #include "platform/message_boxes.h"
@@ -49,7 +50,7 @@ QDate FrmImportarQuotas::today()
     return pinnedToday().isValid() ? pinnedToday() : QDate::currentDate();
 }
 
-FrmImportarQuotas::FrmImportarQuotas(QWidget* owner)
+FrmImportarQuotas::FrmImportarQuotas(QWidget* owner, Mode mode)
     : QDialog(owner, Qt::Dialog | Qt::MSWindowsFixedSizeDialogHint | Qt::CustomizeWindowHint | Qt::WindowTitleHint
                          | Qt::WindowCloseButtonHint),
       Label3(place(new QLabel(QStringLiteral("Ano de Importação:"), this), QStringLiteral("Label3"), twips(180, 180, 1755, 255))),
@@ -61,10 +62,16 @@ FrmImportarQuotas::FrmImportarQuotas(QWidget* owner)
       Label1(place(new QLabel(QStringLiteral("Referente a:"), this), QStringLiteral("Label1"), twips(4920, 1440, 1755, 255))),
       List3(place(new QListWidget(this), QStringLiteral("List3"), twips(4920, 1680, 1815, 1425))),
       Check1(place(new QCheckBox(QStringLiteral("Os registos estão separados com um ponto (.)"), this),
-                   QStringLiteral("Check1"), twips(180, 3330, 6585, 285)))
+                   QStringLiteral("Check1"), twips(180, 3330, 6585, 285))),
+      m_mode(mode)
 {
     setObjectName(QStringLiteral("frmImportarQuotas"));
     setWindowTitle(QStringLiteral("Importar Registos de Quotas"));
+    if (mode == Mode::DryRun) {
+        setObjectName(QStringLiteral("frmSimularImportacao"));
+        setWindowTitle(QStringLiteral("Simular Importação"));
+        Command1->setText(QStringLiteral("&Simular"));
+    }
     setAttribute(Qt::WA_DeleteOnClose);
     setFixedSize(twips(0, 0, 6945, 3795).size());
     useDialogFont(this);
@@ -119,10 +126,22 @@ void FrmImportarQuotas::executar()
     // Nothing may escape into the event loop: what the run does not tell the
     // user itself (a file that cannot be read, say) is told here.
     try {
-        const ImportSummary summary = ProcessarImportacao(month, year, tipo);
-        if (summary.lines > 0)
-            msgBox(QStringLiteral("Fim da importação de quotas.\n\n") + summary.counts(), Buttons::Ok, Icon::Information,
-                   windowTitle());
+        if (m_mode == Mode::DryRun) {
+            ImportVerdicts verdicts;
+            SimularImportacao(month, year, tipo, verdicts);
+            // A list the import would refuse has been told of by the run.
+            if (!verdicts.lines.empty()) {
+                DryRunWindow window(std::move(verdicts),
+                                    QStringLiteral("%1, %2 de %3").arg(selected(List3), selected(List2), selected(List1)),
+                                    this);
+                window.exec();
+            }
+        } else {
+            const ImportSummary summary = ProcessarImportacao(month, year, tipo);
+            if (summary.lines > 0)
+                msgBox(QStringLiteral("Fim da importação de quotas.\n\n") + summary.counts(), Buttons::Ok, Icon::Information,
+                       windowTitle());
+        }
     } catch (const QuotasError& e) {
         msgBox(e.message(), Buttons::Ok, Icon::Critical);
     } catch (const std::exception& e) {

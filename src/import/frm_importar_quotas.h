@@ -17,7 +17,13 @@ namespace quotas {
 class FrmImportarQuotas : public QDialog {
     Q_OBJECT
 public:
-    explicit FrmImportarQuotas(QWidget* owner = nullptr);
+    // DryRun: the same choices for "Simular Importação", which shows what
+    // the import would do with every line and writes nothing.
+    enum class Mode {
+        Import,
+        DryRun
+    };
+    explicit FrmImportarQuotas(QWidget* owner = nullptr, Mode mode = Mode::Import);
 
     // 1 to 12 for a name equal to one of them (case included), else 0.
     static int monthFromName(const QString& name);
@@ -43,6 +49,7 @@ private:
     QLabel* Label1;
     QListWidget* List3;
     QCheckBox* Check1;
+    Mode m_mode;
     bool m_running = false;
 };
 

@@ -5,6 +5,7 @@
 #include "component/shared_objects.h"
 #include "generation/substituir_caracter.h"
 #include "import/import_recordset.h"
+#include "import/import_verdict.h"
 #include "import/rejects_listing.h"
 #include "platform/components.h"
 #include "platform/errors.h"
@@ -18,6 +19,7 @@
 #include <cmath>
 #include <memory>
 #include <optional>
+#include <unordered_map>
 
 namespace quotas {
 
@@ -84,11 +86,7 @@ std::optional<double> readAmount(const QVariant& value, bool wholeCents)
     return roundCents(wholeCents ? *number / 100.0 : *number);
 }
 
-enum class Outcome {
-    Posted,
-    LeftAlone,
-    Rejected
-};
+using Outcome = ImportVerdict::Kind;
 
 // The run's state for the lines.
 struct Lines {
@@ -103,38 +101,67 @@ struct Lines {
     int year;
     int tipo;
 
-    // Why the last line was rejected, as the listing says it.
-    QString reason;
+    // Set for the dry run: the lines are decided and nothing is written. A
+    // line it would post leaves its amount here, by quota_id, so that a later
+    // line of the same movement is decided as the import would decide it.
+    std::unordered_map<qint64, double>* simulated = nullptr;
+    // What was decided for the current line, and why.
+    ImportVerdict verdict;
 
-    Outcome rejected(const char* why)
+    QVariant movementAmount(const QString& column) const
     {
-        reason = QString::fromUtf8(why);
-        return Outcome::Rejected;
+        if (simulated) {
+            const auto posted = simulated->find(movements.value(QStringLiteral("quota_id")).toLongLong());
+            if (posted != simulated->end())
+                return posted->second;  // quota and pago alike
+        }
+        return movements.value(column);
+    }
+    Outcome decided(Outcome kind, const QString& reason = QString())
+    {
+        verdict.kind = kind;
+        verdict.reason = reason;
+        return kind;
     }
 
+    // Decides the current source line and, unless this is the dry run, posts it.
     Outcome process()
     {
+        verdict = ImportVerdict{};
         const QVariant key = source.value(0);
+        verdict.noTap = key.toString();
         movements.moveFirst();
         if (key.isNull() || !movements.find(QStringLiteral("no_tap"), key.toString()))
-            return rejected("sem quota gerada");
+            return decided(Outcome::Reject, QStringLiteral("sem quota gerada"));
+        const double charged = amountOf(movementAmount(QStringLiteral("quota")));
+        const bool unpaid = cents(amountOf(movementAmount(QStringLiteral("pago")))) == 0;
+        verdict.matched = true;
+        verdict.quotaBefore = cents(charged);
+        verdict.pagoBefore = cents(amountOf(movementAmount(QStringLiteral("pago"))));
         // The account of the member whose movement was found, so that a staff
         // number two members share can never split one line between them.
         accounts.moveFirst();
         if (!accounts.find(QStringLiteral("socio_id"), movements.value(QStringLiteral("socio_id"))))
-            return rejected("sem conta");
+            return decided(Outcome::Reject, QStringLiteral("sem conta"));
 
         const std::optional<double> q = readAmount(source.value(quotaColumn), wholeCents);
+        if (!q)
+            return decided(Outcome::Reject, QStringLiteral("valor ilegível"));
         std::optional<double> r;
-        if (rend1Column >= 0)
+        if (rend1Column >= 0) {
             r = readAmount(source.value(rend1Column), wholeCents);
-        if (!q || (rend1Column >= 0 && !r))
-            return rejected("valor ilegível");
+            if (!r)
+                return decided(Outcome::Reject, QStringLiteral("valor ilegível"));
+        }
 
-        const double charged = amountOf(movements.value(QStringLiteral("quota")));
-        const bool unpaid = cents(amountOf(movements.value(QStringLiteral("pago")))) == 0;
         if (!((unpaid && cents(*q) != 0) || cents(*q) > cents(charged)))
-            return Outcome::LeftAlone;
+            return decided(Outcome::LeaveAlone, unpaid ? QStringLiteral("desconto de 0,00") : QStringLiteral("já registada"));
+        decided(Outcome::Post);
+        verdict.quotaAfter = verdict.pagoAfter = cents(*q);
+        if (simulated) {
+            (*simulated)[movements.value(QStringLiteral("quota_id")).toLongLong()] = *q;
+            return Outcome::Post;
+        }
 
         movements.setValue(QStringLiteral("rend1"), r ? QVariant(*r) : accounts.value(QStringLiteral("ult_rend1")));
         movements.setValue(QStringLiteral("rend2"), 0.0);
@@ -166,7 +193,7 @@ struct Lines {
         movements.update();
         accounts.update();
         line.commit();
-        return Outcome::Posted;
+        return Outcome::Post;
     }
 
     // After a rollback the line's two rows hold values the database may no
@@ -264,7 +291,11 @@ RejectsListing setRejectsListing(RejectsListing listing)
     return previous;
 }
 
-ImportSummary ProcessarImportacao(int month, int year, int tipo)
+namespace {
+
+// The import, or with dryRun only its decisions: the same reading of the
+// list and the same matching, the sets opened read-only and nothing written.
+ImportSummary runImport(int month, int year, int tipo, ImportVerdicts* verdicts, bool dryRun)
 {
     ImportSummary summary;
     std::unique_ptr<QObject> component = createComponent(QStringLiteral("Dorvanta.General"));
@@ -307,14 +338,15 @@ ImportSummary ProcessarImportacao(int month, int year, int tipo)
     Connection& connection = Data().SqlServer;
     Recordset movements;
     Recordset accounts;
+    const Lock lock = dryRun ? Lock::ReadOnly : Lock::Pessimistic;
     try {
         movements.open(QStringLiteral("Select tbSocios.no_tap,tbQuotas_Movimentos.* from tbQuotas_Movimentos left outer "
                                       "join tbsocios on tbQuotas_Movimentos.socio_id = tbSocios.socio_id where (ano=? "
                                       "and mes=? and tipo=?)"),
-                       connection, Cursor::Keyset, Lock::Pessimistic, {year, month, tipo});
+                       connection, Cursor::Keyset, lock, {year, month, tipo});
         accounts.open(QStringLiteral("Select tbSocios.no_tap,tbQuotas_Socios.* from tbQuotas_Socios left outer join "
                                      "tbsocios on tbQuotas_Socios.socio_id = tbSocios.socio_id"),
-                      connection, Cursor::Keyset, Lock::Pessimistic);
+                      connection, Cursor::Keyset, lock);
     } catch (const QuotasError& e) {
         component.reset();
         progress.release();
@@ -332,11 +364,14 @@ ImportSummary ProcessarImportacao(int month, int year, int tipo)
         summary.refusal = QStringLiteral("Não foram processados os registos de quotas referente a %1 / %2.").arg(month).arg(year);
         msgBox(summary.refusal + QStringLiteral("\n\nGere primeiro as quotas de %1 de %2 (\"Gerar Quotas\").").arg(monthNames().value(month - 1, QString::number(month))).arg(year));
     } else {
-        Lines lines{source, movements, accounts, connection, quotaColumn, rend1Column, shared().SemSeparadorDecimal, month, year, tipo, {}};
+        Lines lines{source, movements, accounts, connection, quotaColumn, rend1Column, shared().SemSeparadorDecimal, month, year, tipo, nullptr, ImportVerdict{}};
+        std::unordered_map<qint64, double> simulated;
+        if (dryRun)
+            lines.simulated = &simulated;
         LazyCommits lazy(connection);
         while (!source.eof()) {
             ++summary.lines;
-            Outcome outcome = Outcome::Rejected;
+            Outcome outcome = Outcome::Reject;
             try {
                 outcome = lines.process();
             } catch (const ConnectionLostError& e) {
@@ -354,17 +389,21 @@ ImportSummary ProcessarImportacao(int month, int year, int tipo)
                                       .arg(summary.posted));
             } catch (const ConcurrencyError&) {
                 ++summary.failed;
-                lines.reason = QStringLiteral("alterado por outro utilizador");
                 lines.resynchronise();
+                lines.decided(Outcome::Reject, QStringLiteral("alterado por outro utilizador"));
             } catch (const QuotasError&) {
                 ++summary.failed;
-                lines.reason = QStringLiteral("não gravado");
                 lines.resynchronise();
+                lines.decided(Outcome::Reject, QStringLiteral("não gravado"));
             }
-            if (outcome == Outcome::Posted)
+            if (verdicts) {
+                lines.verdict.line = summary.lines;
+                verdicts->lines.push_back(lines.verdict);
+            }
+            if (outcome == Outcome::Post)
                 ++summary.posted;
-            else if (outcome == Outcome::Rejected)
-                copyToRejects(rejects, source, lines.reason);
+            else if (outcome == Outcome::Reject && !dryRun)
+                copyToRejects(rejects, source, lines.verdict.reason);
             progress.call("setvalor", {1});
             source.moveNext();
         }
@@ -376,6 +415,10 @@ ImportSummary ProcessarImportacao(int month, int year, int tipo)
     accounts.close();
     progress.release();
 
+    if (dryRun) {
+        summary.rejected = verdicts ? verdicts->count(Outcome::Reject) : 0;
+        return summary;
+    }
     summary.rejected = rejects.recordCount();
     if (summary.rejected == 0)
         return summary;
@@ -402,6 +445,18 @@ ImportSummary ProcessarImportacao(int month, int year, int tipo)
                Buttons::Ok, Icon::Exclamation);
     }
     return summary;
+}
+
+}  // namespace
+
+ImportSummary ProcessarImportacao(int month, int year, int tipo, ImportVerdicts* verdicts)
+{
+    return runImport(month, year, tipo, verdicts, false);
+}
+
+ImportSummary SimularImportacao(int month, int year, int tipo, ImportVerdicts& verdicts)
+{
+    return runImport(month, year, tipo, &verdicts, true);
 }
 
 }  // namespace quotas

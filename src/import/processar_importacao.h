@@ -1,5 +1,7 @@
 #pragma once
 
+#include "import/import_verdict.h"
+
 #include <QString>
 #include <functional>
 
@@ -38,7 +40,15 @@ struct ImportSummary {
 //   when shared().SemSeparadorDecimal is set, and kept in whole cents.
 // - The source's failures (no file readable, say) pass to the caller as
 //   QuotasError before anything is changed.
-ImportSummary ProcessarImportacao(int month, int year, int tipo);
+// - With verdicts, what was done with each line is added to it.
+ImportSummary ProcessarImportacao(int month, int year, int tipo, ImportVerdicts* verdicts = nullptr);
+
+// The import's dry run: reads the list and decides every line exactly as
+// ProcessarImportacao does (the same code decides), adding the verdicts to
+// verdicts, and writes nothing at all: not the movements, not the accounts,
+// not extras; no rejects listing. Its messages are the import's for a list
+// it cannot go through. rejected counts the lines it would reject.
+ImportSummary SimularImportacao(int month, int year, int tipo, ImportVerdicts& verdicts);
 
 // What the run does to show the rejects listing, after extras has been
 // rewritten, with SqlServer_Prints open: showRejectsListing() unless

@@ -50,11 +50,11 @@ void MemberRegister::reload(quotas::Connection& connection)
     // the register costs one reading however many members there are.
     quotas::Recordset rs;
     rs.open(QStringLiteral("SELECT tbSocios.socio_id, tbSocios.no_tap, tbSocios.nome, tbQuotas_Socios.total_quotas, "
-                           "tbQuotas_Socios.total_pago, m.quotas, m.pagos FROM tbSocios "
+                           "tbQuotas_Socios.total_pago, SUM(m.quota), SUM(m.pago), COUNT(m.socio_id) FROM tbSocios "
                            "LEFT OUTER JOIN tbQuotas_Socios ON tbSocios.socio_id = tbQuotas_Socios.socio_id "
-                           "LEFT OUTER JOIN (SELECT socio_id, SUM(quota) AS quotas, SUM(pago) AS pagos "
-                           "FROM tbQuotas_Movimentos GROUP BY socio_id) m ON tbSocios.socio_id = m.socio_id "
-                           "ORDER BY tbSocios.socio_id"),
+                           "LEFT OUTER JOIN tbQuotas_Movimentos m ON tbSocios.socio_id = m.socio_id "
+                           "GROUP BY tbSocios.socio_id, tbSocios.no_tap, tbSocios.nome, tbQuotas_Socios.total_quotas, "
+                           "tbQuotas_Socios.total_pago ORDER BY tbSocios.socio_id"),
             connection, quotas::Cursor::ForwardOnly, quotas::Lock::ReadOnly);
     QList<Member> members;
     members.reserve(rs.recordCount());
@@ -68,7 +68,7 @@ void MemberRegister::reload(quotas::Connection& connection)
         m.hasAccount = !rs.value(3).isNull() || !rs.value(4).isNull();
         m.totalQuotas = rs.value(3).toDouble();
         m.totalPago = rs.value(4).toDouble();
-        const bool hasMovements = !rs.value(5).isNull();
+        const bool hasMovements = rs.value(7).toInt() > 0;
         const double charged = rs.value(5).toDouble(), paid = rs.value(6).toDouble();
         m.owed = quotas::roundCents(charged - paid);
         m.stale = (hasMovements || m.hasAccount)

@@ -154,7 +154,7 @@ private slots:
         QTest::addColumn<QString>("opens");
         QTest::addColumn<int>("buttons");  // of a message box
         QTest::addColumn<QString>("enter");
-        const std::pair<const char*, const char*> windows[] = {{"registo", ""}, {"gerar-quotas", "GerarQuotas"}, {"importar-quotas", "ImportarQuotas"}, {"quota", "Registo"}, {"manutencao", "CallManutencaoDados"}, {"pre-visualizacao", "ListagemDividas"}};
+        const std::pair<const char*, const char*> windows[] = {{"registo", ""}, {"gerar-quotas", "GerarQuotas"}, {"importar-quotas", "ImportarQuotas"}, {"quota", "Registo"}, {"manutencao", "CallManutencaoDados"}, {"pre-visualizacao", "ListagemDividas"}, {"anular-geracao", "AnularGeracao"}, {"resumo-mes", "ResumoMes"}, {"extrato-quotas", "ExtratoQuotas"}};
         for (const auto& [name, action] : windows)
             QTest::newRow(name) << QString::fromLatin1(action) << -1 << QString();
         QTest::newRow("eliminar") << "box" << int(Buttons::YesNoDefaultNo) << "&Não";

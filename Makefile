@@ -1,7 +1,8 @@
 # The two commands of a fresh Debian 12 machine: `make run` and `make test`.
 # `make check` adds what CI runs beside the tests: the layout check and the
-# sanitizer build with the fuzz targets. `make check-tidy` runs clang-tidy.
-.PHONY: build run test check check-sanitize check-tidy check-format bench clean
+# sanitizer build with the fuzz targets. `make check-tidy` runs clang-tidy. `make package` builds the Debian package of an
+# installation.
+.PHONY: build run test check check-sanitize check-tidy check-format bench package clean
 
 build:
 	scripts/setup.sh
@@ -25,6 +26,10 @@ check-format:
 
 bench:
 	scripts/bench.sh
+
+package:
+	scripts/setup.sh
+	cmake --build build --target package
 
 clean:
 	rm -rf build build-rel build-sanitize

@@ -11,14 +11,7 @@ namespace quotas::cli {
 // Prints the plan; only --confirmar removes anything, without a question.
 int anularGeracao(const QStringList& args)
 {
-    const Options options(
-        QStringLiteral("anular-geracao"),
-        {{QStringLiteral("ano"), QStringLiteral("Ano das quotas geradas."), QStringLiteral("A")},
-         {QStringLiteral("mes"), QStringLiteral("Mês das quotas geradas (1 a 12)."), QStringLiteral("M")},
-         {QStringLiteral("tipo"), QStringLiteral("Só as quotas deste tipo (1 Sindicato, 2 Seguro)."), QStringLiteral("1|2")},
-         {QStringLiteral("no-tap"), QStringLiteral("Só o associado com este Número de Empresa."), QStringLiteral("N")},
-         {QStringLiteral("confirmar"), QStringLiteral("Elimina as quotas do plano (sem esta opção nada muda).")}},
-        args);
+    const Options options(QStringLiteral("anular-geracao"), args);
     UndoChoice choice;
     choice.ano = options.number(QStringLiteral("ano"), 1900, 9999);
     choice.mes = options.number(QStringLiteral("mes"), 1, 12);

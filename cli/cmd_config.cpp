@@ -14,13 +14,7 @@ namespace quotas::cli {
 
 int config(const QStringList& args)
 {
-    const Options options(QStringLiteral("config"),
-                          {{QStringLiteral("data-source"), QStringLiteral("Origem dos dados."), QStringLiteral("DS")},
-                           {QStringLiteral("catalog"), QStringLiteral("Base de dados."), QStringLiteral("NOME")},
-                           {QStringLiteral("user"), QStringLiteral("Utilizador."), QStringLiteral("U")},
-                           {QStringLiteral("password"), QStringLiteral("Palavra-passe."), QStringLiteral("P")},
-                           {QStringLiteral("security-info"), QStringLiteral("Persist Security Info."), QStringLiteral("TEXTO")}},
-                          args);
+    const Options options(QStringLiteral("config"), args);
     if (!options.isSet(QStringLiteral("data-source")) || options.value(QStringLiteral("data-source")).trimmed().isEmpty())
         throw UsageError(QStringLiteral("config: falta --data-source."));
     // The reader takes one line per value and Windows-1252 text (the

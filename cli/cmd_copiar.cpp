@@ -29,13 +29,7 @@ QString shellWord(const QString& text)
 // left pointing where they were until the printed command is run.
 int copiar(const QStringList& args)
 {
-    const Options options(QStringLiteral("copiar"),
-                          {{QStringLiteral("data-source"), QStringLiteral("Servidor de destino, HOST ou HOST,PORTA."),
-                            QStringLiteral("HOST[,PORTA]")},
-                           {QStringLiteral("catalog"), QStringLiteral("Base de dados de destino (vazia)."), QStringLiteral("BD")},
-                           {QStringLiteral("user"), QStringLiteral("Utilizador."), QStringLiteral("U")},
-                           {QStringLiteral("password"), QStringLiteral("Palavra-passe."), QStringLiteral("P")}},
-                          args);
+    const Options options(QStringLiteral("copiar"), args);
     LoginSettings to;
     to.securityInfo = QStringLiteral("False");
     to.dataSource = options.value(QStringLiteral("data-source")).trimmed();

@@ -11,12 +11,7 @@ namespace quotas::cli {
 // message, and the dues that could not be generated after it.
 int gerar(const QStringList& args)
 {
-    const Options options(QStringLiteral("gerar"),
-                          {{QStringLiteral("ano"), QStringLiteral("Ano de processamento."), QStringLiteral("A")},
-                           {QStringLiteral("mes"), QStringLiteral("Mês de processamento (1 a 12)."), QStringLiteral("M")},
-                           {QStringLiteral("no-tap"), QStringLiteral("Só o associado com este Número de Empresa."),
-                            QStringLiteral("N")}},
-                          args);
+    const Options options(QStringLiteral("gerar"), args);
     const int ano = options.number(QStringLiteral("ano"), 1900, 9999);
     const int mes = options.number(QStringLiteral("mes"), 1, 12);
     connectOrFail();

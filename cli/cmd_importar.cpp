@@ -33,15 +33,7 @@ int simulate(int month, int year, int tipo)
 
 int importar(const QStringList& args)
 {
-    const Options options(
-        QStringLiteral("importar"),
-        {{QStringLiteral("ano"), QStringLiteral("Ano das quotas."), QStringLiteral("A")},
-         {QStringLiteral("mes"), QStringLiteral("Mês das quotas (1 a 12)."), QStringLiteral("M")},
-         {QStringLiteral("tipo"), QStringLiteral("1 Sindicato, 2 Plano de Saúde."), QStringLiteral("T")},
-         {QStringLiteral("sem-separador"), QStringLiteral("Os valores são cêntimos, sem ponto decimal.")},
-         {QStringLiteral("pdf"), QStringLiteral("Escreve aqui a listagem dos registos não importados."), QStringLiteral("SAIDA")},
-         {QStringLiteral("simular"), QStringLiteral("Não grava nada: diz, linha a linha, o que a importação faria.")}},
-        args, 1);
+    const Options options(QStringLiteral("importar"), args);
     const int year = options.number(QStringLiteral("ano"), 1000, 9999);
     const int month = options.number(QStringLiteral("mes"), 1, 12);
     const int tipo = options.number(QStringLiteral("tipo"), 1, 2);

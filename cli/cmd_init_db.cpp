@@ -14,9 +14,7 @@ namespace quotas::cli {
 
 int initDb(const QStringList& args)
 {
-    const Options options(QStringLiteral("init-db"),
-                          {{QStringLiteral("demo"), QStringLiteral("Associados de demonstração."), QStringLiteral("N")}},
-                          args);
+    const Options options(QStringLiteral("init-db"), args);
     const int demo = options.isSet(QStringLiteral("demo")) ? options.number(QStringLiteral("demo"), 0, 10000000) : 0;
     LoginSettings settings;
     QString missing;

@@ -35,8 +35,7 @@ void connectOrFail()
 
 int login(const QStringList& args)
 {
-    const Options options(QStringLiteral("login"),
-                          {{QStringLiteral("print-connection-string"), QStringLiteral("Mostra o texto de ligação.")}}, args);
+    const Options options(QStringLiteral("login"), args);
     connectOrFail();
     if (options.isSet(QStringLiteral("print-connection-string")))
         std::fputs((Data().SqlServer.connectionString() + u'\n').toUtf8().constData(), stdout);

@@ -51,7 +51,7 @@ private:
 
 int manutencao(const QStringList& args)
 {
-    const Options options(QStringLiteral("manutencao"), {}, args);
+    const Options options(QStringLiteral("manutencao"), args);
     connectOrFail();
     ConsolePanel panel;
     // The same run as the dialog's "&Iniciar": the completion box prints on

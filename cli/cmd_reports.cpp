@@ -11,10 +11,7 @@ namespace {
 
 QString pdfPath(const QString& command, const QStringList& args)
 {
-    const Options options(command,
-                          {{QStringLiteral("pdf"), QStringLiteral("Escreve as páginas neste ficheiro PDF."),
-                            QStringLiteral("SAIDA")}},
-                          args);
+    const Options options(command, args);
     const QString path = options.value(QStringLiteral("pdf"));
     if (path.isEmpty())
         throw UsageError(QStringLiteral("%1: falta --pdf SAIDA.").arg(command));

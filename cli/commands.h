@@ -3,6 +3,7 @@
 #include "platform/errors.h"
 
 #include <QStringList>
+#include <vector>
 
 namespace quotas::cli {
 
@@ -15,6 +16,31 @@ public:
 // The exit statuses: 0 done; kLeftOut done with something left out (the
 // count on stdout); 1 failed (the reason on stderr); 2 usage or settings.
 constexpr int kLeftOut = 3;
+
+// One option of a command: its long name, the name of its value (none for a
+// switch) and one line of help. A required option is shown without brackets.
+struct OptionHelp {
+    const char* name;
+    const char* value;
+    const char* text;
+    bool required = false;
+};
+
+// One command of the command line. The table of them is the one source of
+// the dispatch, the parsing of options, "quotas COMMAND --help" and the manual.
+struct Command {
+    const char* name;
+    int (*run)(const QStringList& args);
+    const char* summary;      // one line in "quotas --help"
+    const char* description;  // the paragraph of "quotas COMMAND --help" and the manual
+    std::vector<OptionHelp> options;
+    const char* operand = nullptr;  // a file named after the options, if the command takes one
+    const char* operandText = nullptr;
+};
+
+// Every command, in the order of the help.
+const std::vector<Command>& commands();
+const Command* findCommand(const QString& name);
 
 // Each command takes the arguments after its name and returns the exit status.
 int config(const QStringList& args);

@@ -1,11 +1,11 @@
 // quotas: the dues module from the command line, for cron jobs, scripts and
-// tests. Message boxes print as lines on stdout. Exit status 0 when all was
-// done, 3 when done with something left out (the count on stdout), 1 for a
-// failure (the reason on stderr), 2 for a usage or settings problem.
+// tests. Message boxes print as lines on stdout. The commands, their options
+// and the exit statuses are listed in cli/commands.cpp and cli/help.cpp.
 
 #include "cli/commands.h"
 #include "cli/console_boxes.h"
 #include "cli/console_progress.h"
+#include "cli/help.h"
 #include "component/shared_objects.h"
 #include "settings/settings_location.h"
 
@@ -15,31 +15,13 @@
 #include <cstdio>
 #include <sys/stat.h>
 #include <unistd.h>
-#include <functional>
-#include <map>
+#include <algorithm>
 
 namespace {
 
-const char* const kUsage =
-    "Utilização: quotas [--registry FICHEIRO] COMANDO [OPÇÕES]\n"
-    "  config --data-source DS [--catalog NOME] [--user U] [--password P] [--security-info TEXTO]\n"
-    "  init-db [--demo N]\n"
-    "  login [--print-connection-string]\n"
-    "  gerar --ano A --mes M [--no-tap N]\n"
-    "  anular-geracao --ano A --mes M [--tipo 1|2] [--no-tap N] [--confirmar]\n"
-    "  importar --ano A --mes M --tipo 1|2 [--sem-separador] [--pdf SAIDA | --simular] FICHEIRO\n"
-    "  manutencao\n"
-    "  copiar --data-source HOST[,PORTA] --catalog BD --user U --password P\n"
-    "  listagem --pdf SAIDA | cartas --pdf SAIDA | rejeitados --pdf SAIDA\n"
-    "  extrato --no-tap N [--desde AAAA-MM] [--ate AAAA-MM] [--todos-os-movimentos] --pdf SAIDA\n"
-    "  resumo --ano A --mes M [--pdf SAIDA] [--csv SAIDA]\n"
-    "Estado de saída: 0 feito; 3 feito, mas ficou algo por fazer (quotas por gerar, linhas rejeitadas;\n"
-    "  a contagem sai no stdout); 1 falhou (a razão sai no stderr); 2 utilização ou configuração.\n";
+void print(FILE* stream, const QString& text) { std::fputs(text.toUtf8().constData(), stream); }
 
-void printError(const QString& text)
-{
-    std::fputs(("quotas: " + text + "\n").toUtf8().constData(), stderr);
-}
+void printError(const QString& text) { print(stderr, QStringLiteral("quotas: ") + text + u'\n'); }
 
 int dispatch(QStringList args)
 {
@@ -51,32 +33,30 @@ int dispatch(QStringList args)
         quotas::setRegistryPath(args.front().mid(11));
         args = args.mid(1);
     }
-    if (args.isEmpty() || args.front() == QStringLiteral("--help") || args.front() == QStringLiteral("-h")) {
-        std::fputs(kUsage, args.isEmpty() ? stderr : stdout);
-        return args.isEmpty() ? 2 : 0;
-    }
-    static const std::map<QString, std::function<int(const QStringList&)>> commands = {
-        {QStringLiteral("config"), config},
-        {QStringLiteral("init-db"), initDb},
-        {QStringLiteral("login"), login},
-        {QStringLiteral("gerar"), gerar},
-        {QStringLiteral("anular-geracao"), anularGeracao},
-        {QStringLiteral("copiar"), copiar},
-        {QStringLiteral("importar"), importar},
-        {QStringLiteral("manutencao"), manutencao},
-        {QStringLiteral("listagem"), listagem},
-        {QStringLiteral("cartas"), cartas},
-        {QStringLiteral("rejeitados"), rejeitados},
-        {QStringLiteral("extrato"), extrato},
-        {QStringLiteral("resumo"), resumo},
-    };
-    const auto command = commands.find(args.front());
-    if (command == commands.end()) {
-        printError(QStringLiteral("comando desconhecido \"%1\".").arg(args.front()));
-        std::fputs(kUsage, stderr);
+    const auto isHelp = [](const QString& arg) { return arg == QStringLiteral("--help") || arg == QStringLiteral("-h"); };
+    if (args.isEmpty()) {
+        printError(QStringLiteral("falta o comando (veja \"quotas --help\")."));
         return 2;
     }
-    return command->second(args.mid(1));
+    if (isHelp(args.front())) {
+        print(stdout, generalHelp());
+        return 0;
+    }
+    if (args.front() == QStringLiteral("--version")) {
+        print(stdout, versionText());
+        return 0;
+    }
+    const Command* command = findCommand(args.front());
+    if (!command) {
+        printError(QStringLiteral("comando desconhecido \"%1\" (veja \"quotas --help\").").arg(args.front()));
+        return 2;
+    }
+    args.removeFirst();
+    if (std::any_of(args.cbegin(), args.cend(), isHelp)) {
+        print(stdout, commandHelp(*command));
+        return 0;
+    }
+    return command->run(args);
 }
 
 }  // namespace

@@ -4,14 +4,19 @@
 
 namespace quotas::cli {
 
-Options::Options(const QString& command, const QList<QCommandLineOption>& options, const QStringList& args,
-                 int positional)
+Options::Options(const QString& command, const QStringList& args)
     : m_command(command)
 {
+    const Command* entry = findCommand(command);
+    Q_ASSERT(entry);
+    for (const OptionHelp& option : entry->options)
+        m_parser.addOption(option.value ? QCommandLineOption(QString::fromUtf8(option.name), QString::fromUtf8(option.text),
+                                                             QString::fromUtf8(option.value))
+                                        : QCommandLineOption(QString::fromUtf8(option.name), QString::fromUtf8(option.text)));
     m_parser.setSingleDashWordOptionMode(QCommandLineParser::ParseAsLongOptions);
-    m_parser.addOptions(options);
     if (!m_parser.parse(QStringList{command} + args))
         throw UsageError(QStringLiteral("%1: %2").arg(command, m_parser.errorText()));
+    const int positional = entry->operand ? 1 : 0;
     if (m_parser.positionalArguments().size() != positional)
         throw UsageError(positional == 0
                              ? QStringLiteral("%1: argumentos a mais: %2").arg(command, m_parser.positionalArguments().join(u' '))

@@ -5,12 +5,12 @@
 
 namespace quotas::cli {
 
-// A command's options, parsed strictly: an unknown option or a missing
-// value is a UsageError.
+// A command's options as its entry in the command table lists them, parsed
+// strictly: an unknown option, a missing value or a missing file is a
+// UsageError.
 class Options {
 public:
-    Options(const QString& command, const QList<QCommandLineOption>& options, const QStringList& args,
-            int positional = 0);
+    Options(const QString& command, const QStringList& args);
 
     bool isSet(const QString& name) const { return m_parser.isSet(name); }
     QString value(const QString& name) const { return m_parser.value(name); }

@@ -12,9 +12,41 @@
 
 #include <QApplication>
 #include <QCommandLineParser>
+#include <cstdio>
+#include <string_view>
+
+namespace {
+
+// Qt's own --help and --version would answer in English.
+const char* const kHelp =
+    "Utilização: quotas-host [--registry FICHEIRO]\n"
+    "            quotas-host --help | --version\n\n"
+    "O registo de associados com o menu Quotas.\n\n"
+    "Opções:\n"
+    "  --registry FICHEIRO  Ficheiro de configuração (senão $QUOTAS_REGISTRY, senão /etc/quotas/registry.reg).\n"
+    "  -h, --help           Mostra esta ajuda.\n"
+    "  --version            Mostra a versão.\n\n"
+    "Estado de saída:\n"
+    "  0  o programa foi fechado normalmente;\n"
+    "  1  não foi possível ligar à base de dados;\n"
+    "  2  erro de utilização ou falta a configuração.\n";
+
+}  // namespace
 
 int main(int argc, char** argv)
 {
+    // Help and version need no display, so they are answered before Qt starts.
+    for (int i = 1; i < argc; ++i) {
+        const std::string_view arg(argv[i]);
+        if (arg == "--help" || arg == "-h") {
+            std::fputs(kHelp, stdout);
+            return 0;
+        }
+        if (arg == "--version") {
+            std::fputs("quotas-host " QUOTAS_VERSION "\n", stdout);
+            return 0;
+        }
+    }
     QApplication app(argc, argv);
     QApplication::setApplicationName(QStringLiteral("quotas-host"));
     QApplication::setApplicationDisplayName(QStringLiteral("Quotas"));
@@ -23,9 +55,13 @@ int main(int argc, char** argv)
     app.setStyleSheet(QStringLiteral("QAbstractItemView:focus { border: 2px solid palette(highlight); }"));
 
     QCommandLineParser parser;
-    parser.addHelpOption();
     parser.addOption({QStringLiteral("registry"), QStringLiteral("Ficheiro de configuração."), QStringLiteral("FICHEIRO")});
-    parser.process(app);
+    if (!parser.parse(QApplication::arguments()) || !parser.positionalArguments().isEmpty()) {
+        const QString reason = parser.errorText().isEmpty() ? QStringLiteral("argumentos a mais.") : parser.errorText();
+        std::fputs(("quotas-host: " + reason + u'\n').toUtf8().constData(), stderr);
+        std::fputs(kHelp, stderr);
+        return 2;
+    }
     if (parser.isSet(QStringLiteral("registry")))
         quotas::setRegistryPath(parser.value(QStringLiteral("registry")));
 

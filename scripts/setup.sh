@@ -17,6 +17,7 @@ packages=(
   qt6-translations-l10n                           # Qt's own texts in Portuguese (qtbase_pt_BR.qm)
   clang-tidy                                      # scripts/check-tidy.sh
   clang libclang-rt-dev llvm                      # the sanitizer build, libFuzzer, llvm-symbolizer
+  dpkg-dev file                                   # make package: dpkg-shlibdeps computes the dependencies
 )
 missing=()
 for p in "${packages[@]}"; do

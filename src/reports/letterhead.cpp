@@ -5,12 +5,21 @@
 
 #include <QDir>
 #include <QFile>
+#include <QFileInfo>
 
 namespace quotas {
 
 QString letterheadPath()
 {
-    return QDir(installationDataDir()).filePath(QStringLiteral("letterhead.txt"));
+    const QString name = QStringLiteral("letterhead.txt");
+    // The administrator's copy in /etc/quotas is edited in place and kept by
+    // upgrades; a data folder named in the environment (tests, trials) wins.
+    if (qEnvironmentVariableIsEmpty("QUOTAS_DATA_DIR")) {
+        const QString edited = QStringLiteral("/etc/quotas/") + name;
+        if (QFileInfo::exists(edited))
+            return edited;
+    }
+    return QDir(installationDataDir()).filePath(name);
 }
 
 Letterhead readLetterhead(const QString& path)

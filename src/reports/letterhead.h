@@ -5,8 +5,8 @@
 namespace quotas {
 
 // The union's name and postal address at the head of every debt letter:
-// texts of the installation, kept in letterhead.txt in the installation's
-// data folder as UTF-8 lines "nome = ..." and "morada = ..." (lines starting
+// texts of the installation, kept in letterhead.txt (see letterheadPath) as
+// UTF-8 lines "nome = ..." and "morada = ..." (lines starting
 // with "#" are comments). A missing file or line gives the default: the name
 // "Orbela" and no address line.
 struct Letterhead {
@@ -14,6 +14,9 @@ struct Letterhead {
     QString address;
 };
 
+// $QUOTAS_DATA_DIR/letterhead.txt when that variable is set; else
+// /etc/quotas/letterhead.txt when it exists; else the example in the
+// installation's data folder.
 QString letterheadPath();
 
 // Throws QuotasError when the file exists but cannot be read.

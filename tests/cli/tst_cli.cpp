@@ -1,5 +1,6 @@
 // The command line as scripts use it: settings, schema, login, exit statuses.
 
+#include "cli/commands.h"
 #include "support/cli_process.h"
 #include "support/test_database.h"
 
@@ -113,6 +114,27 @@ private slots:
             const Run run = quotas(args);
             QVERIFY2(run.status == 2 && run.err.contains(registry) && run.err.contains("linha 9"), qPrintable(run.err));
         }
+    }
+
+    // Every command of the table is reachable, and its help names each of its
+    // options and the exit statuses.
+    void helpListsEveryCommandAndOption()
+    {
+        const Run general = quotas({QStringLiteral("--help")});
+        QCOMPARE(general.status, 0);
+        for (const cli::Command& command : cli::commands()) {
+            QVERIFY2(general.out.contains(QStringLiteral("\n  %1 ").arg(QLatin1String(command.name))), command.name);
+            const Run help = quotas({QLatin1String(command.name), QStringLiteral("--help")});
+            QCOMPARE(help.status, 0);
+            QVERIFY2(help.out.startsWith(QStringLiteral("Utilização: quotas")), command.name);
+            for (const cli::OptionHelp& option : command.options)
+                QVERIFY2(help.out.contains(QStringLiteral("--%1").arg(QLatin1String(option.name))), option.name);
+            for (int status : {0, 1, 2, 3})
+                QVERIFY2(help.out.contains(QStringLiteral("\n  %1  ").arg(status)), command.name);
+        }
+        const Run version = quotas({QStringLiteral("--version")});
+        QCOMPARE(version.status, 0);
+        QCOMPARE(version.out, QStringLiteral("quotas " QUOTAS_VERSION "\n"));
     }
 
     void anUnreachableDatabaseExitsWithOne()

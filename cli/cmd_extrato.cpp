@@ -27,14 +27,7 @@ int periodOption(const Options& options, const QString& name)
 
 int extrato(const QStringList& args)
 {
-    const Options options(
-        QStringLiteral("extrato"),
-        {{QStringLiteral("no-tap"), QStringLiteral("Número de Empresa do associado."), QStringLiteral("N")},
-         {QStringLiteral("desde"), QStringLiteral("Primeiro mês do extrato."), QStringLiteral("AAAA-MM")},
-         {QStringLiteral("ate"), QStringLiteral("Último mês do extrato."), QStringLiteral("AAAA-MM")},
-         {QStringLiteral("todos-os-movimentos"), QStringLiteral("Também os movimentos inactivos e do histórico.")},
-         {QStringLiteral("pdf"), QStringLiteral("Escreve as páginas neste ficheiro PDF."), QStringLiteral("SAIDA")}},
-        args);
+    const Options options(QStringLiteral("extrato"), args);
     const QString noTap = options.value(QStringLiteral("no-tap"));
     if (noTap.isEmpty())
         throw UsageError(QStringLiteral("extrato: falta --no-tap N."));

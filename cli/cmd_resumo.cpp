@@ -8,13 +8,7 @@ namespace quotas::cli {
 
 int resumo(const QStringList& args)
 {
-    const Options options(
-        QStringLiteral("resumo"),
-        {{QStringLiteral("ano"), QStringLiteral("Ano do resumo."), QStringLiteral("A")},
-         {QStringLiteral("mes"), QStringLiteral("Mês do resumo (1 a 12)."), QStringLiteral("M")},
-         {QStringLiteral("pdf"), QStringLiteral("Escreve a página neste ficheiro PDF."), QStringLiteral("SAIDA")},
-         {QStringLiteral("csv"), QStringLiteral("Escreve os valores neste ficheiro CSV."), QStringLiteral("SAIDA")}},
-        args);
+    const Options options(QStringLiteral("resumo"), args);
     const int year = options.number(QStringLiteral("ano"), 1000, 9999);
     const int month = options.number(QStringLiteral("mes"), 1, 12);
     const QString pdf = options.value(QStringLiteral("pdf"));

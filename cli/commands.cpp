@@ -136,6 +136,33 @@ const std::vector<Command>& commands()
                 {"pdf", "SAIDA", "Ficheiro PDF a escrever.", true},
             },
         },
+        {
+            .name = "extrato",
+            .run = extrato,
+            .summary = "escreve em PDF o extrato de quotas de um associado",
+            .description = "Escreve em PDF o extrato de quotas de um associado: um movimento por linha, por ano, mês "
+                           "e tipo, com o valor, o pago, o que está por liquidar e o saldo em dívida acumulado.",
+            .options = {
+                {"no-tap", "N", "Número de Empresa do associado.", true},
+                {"desde", "AAAA-MM", "Primeiro mês do extrato."},
+                {"ate", "AAAA-MM", "Último mês do extrato."},
+                {"todos-os-movimentos", nullptr, "Também os movimentos inactivos e do histórico."},
+                {"pdf", "SAIDA", "Escreve as páginas neste ficheiro PDF.", true},
+            },
+        },
+        {
+            .name = "resumo",
+            .run = resumo,
+            .summary = "escreve o resumo de um mês em PDF ou CSV",
+            .description = "Escreve o resumo das quotas do mês por tipo e no total (associados, quotas, descontado pela "
+                           "empresa, pago de outra forma e por liquidar) em PDF, em CSV ou em ambos.",
+            .options = {
+                {"ano", "A", "Ano do resumo.", true},
+                {"mes", "M", "Mês do resumo (1 a 12).", true},
+                {"pdf", "SAIDA", "Escreve a página neste ficheiro PDF."},
+                {"csv", "SAIDA", "Escreve os valores neste ficheiro CSV."},
+            },
+        },
     };
     return table;
 }

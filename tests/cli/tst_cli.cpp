@@ -80,7 +80,7 @@ private slots:
     {
         QTest::addColumn<QStringList>("args");
         QTest::addColumn<QString>("named");
-        QTest::newRow("no command") << QStringList{} << "Utilização";
+        QTest::newRow("no command") << QStringList{} << "quotas --help";
         QTest::newRow("unknown command") << QStringList{"voar"} << "voar";
         QTest::newRow("unknown option") << QStringList{"login", "--depressa"} << "depressa";
         QTest::newRow("config without source") << QStringList{"config", "--user", "x"} << "--data-source";

@@ -45,11 +45,6 @@ void General::GerarQuotas()
     showGenerationDialog();
 }
 
-void General::AnularGeracao()
-{
-    showUndoDialog();
-}
-
 bool General::Login(const QVariant&, const QVariant&, const QVariant&)
 {
     DataEnvironment& data = Data();
@@ -85,6 +80,11 @@ void General::ResumoMes()
 void General::SimularImportacao()
 {
     showDryRunDialog();
+}
+
+void General::AnularGeracao()
+{
+    showUndoDialog();
 }
 
 }  // namespace quotas

@@ -27,8 +27,6 @@ public:
     Q_INVOKABLE void ImportarQuotas();
     // The dues generation dialog, modal.
     Q_INVOKABLE void GerarQuotas();
-    // The dialog that takes back a month's generated dues, modal.
-    Q_INVOKABLE void AnularGeracao();
     // Reads the connection settings and opens both connections. False when a
     // setting is missing (no connection touched); the arguments are not used.
     Q_INVOKABLE bool Login(const QVariant& temp1 = QVariant(), const QVariant& temp2 = QVariant(),
@@ -51,6 +49,8 @@ public:
     // The import's dry run: the import dialog's choices, then what the
     // import would do with every line of the list, writing nothing; modal.
     Q_INVOKABLE void SimularImportacao();
+    // The dialog that takes back a month's generated dues, modal.
+    Q_INVOKABLE void AnularGeracao();
 };
 
 }  // namespace quotas

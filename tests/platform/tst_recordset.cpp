@@ -1,6 +1,7 @@
 // The result set on both engines: reading, Null, names, the indexed search,
 // saves by primary key, optimistic conflicts and running totals.
 
+#include "platform/chunked_rows.h"
 #include "platform/errors.h"
 #include "platform/recordset.h"
 #include "platform/transaction.h"
@@ -49,6 +50,38 @@ private slots:
         rs.moveNext();
         QVERIFY(rs.eof());
         QVERIFY_THROWS_EXCEPTION(DbError, rs.value(0));
+    }
+
+    // A chunk that ends the table exactly, a last short one, a condition
+    // of the caller's and a key named otherwise in the result: each row is
+    // read once, in key order.
+    void chunkedRowsReadEveryRowOnceInKeyOrder_data()
+    {
+        QTest::addColumn<int>("members");
+        QTest::addColumn<int>("chunk");
+        QTest::addColumn<QString>("expected");
+        QTest::newRow("exact chunks") << 6 << 3 << "1 2 3 4 5 6";
+        QTest::newRow("last chunk short") << 7 << 3 << "1 2 3 4 5 6 7";
+        QTest::newRow("one chunk") << 2 << 3 << "1 2";
+        QTest::newRow("none") << 0 << 3 << "";
+    }
+
+    void chunkedRowsReadEveryRowOnceInKeyOrder()
+    {
+        QFETCH(int, members);
+        QFETCH(int, chunk);
+        QFETCH(QString, expected);
+        // Stored out of key order, with a row the caller's condition leaves out.
+        for (int i = members; i >= 1; --i)
+            c().execute(QStringLiteral("INSERT INTO tbSocios (socio_id, nome) VALUES (?, 'x')"), {i * 10});
+        c().execute(QStringLiteral("INSERT INTO tbSocios (socio_id, nome) VALUES (999, 'y')"));
+        ChunkedRows rows(c(),
+                         QStringLiteral("SELECT nome, socio_id AS no FROM tbSocios WHERE nome = ?%1 ORDER BY socio_id"),
+                         QStringLiteral("socio_id"), QStringLiteral("no"), {QStringLiteral("x")}, chunk);
+        QStringList read;
+        for (; !rows.eof(); rows.moveNext())
+            read << QString::number(rows.value(rows.fieldIndex(QStringLiteral("no"))).toInt() / 10);
+        QCOMPARE(read.join(u' '), expected);
     }
 
     void findGivesTheFirstMatchAtOrAfterTheCurrentRow_data()

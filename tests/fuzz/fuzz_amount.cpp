@@ -11,10 +11,10 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     static const QLocale locales[] = {QLocale::c(), QLocale(QLocale::Portuguese, QLocale::Portugal),
                                       QLocale(QLocale::German, QLocale::Germany), QLocale(QLocale::English, QLocale::UnitedStates)};
     const QString text = QString::fromUtf8(reinterpret_cast<const char*>(data), qsizetype(size));
+    const std::optional<double> value = quotas::parseDecimal(text);
+    if (!value)
+        return 0;
     for (const QLocale& locale : locales) {
-        const std::optional<double> value = quotas::parseDecimal(text, locale);
-        if (!value)
-            continue;
         if (!std::isfinite(*value))
             std::abort();
         const double cents = quotas::roundCents(*value);

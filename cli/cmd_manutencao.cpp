@@ -56,8 +56,8 @@ int manutencao(const QStringList& args)
     ConsolePanel panel;
     // The same run as the dialog's "&Iniciar": the completion box prints on
     // stdout; a failure comes back as the error, for stderr and exit status 1.
-    ProcessarManutencao(Data().SqlServer, panel);
-    return 0;
+    // Movements left out of the totals: the count is on stdout already.
+    return ProcessarManutencao(Data().SqlServer, panel) > 0 ? 3 : 0;
 }
 
 }  // namespace quotas::cli

@@ -18,6 +18,7 @@ packages=(
   clang-tidy                                      # scripts/check-tidy.sh
   clang libclang-rt-dev llvm                      # the sanitizer build, libFuzzer, llvm-symbolizer
   dpkg-dev file                                   # make package: dpkg-shlibdeps computes the dependencies
+  libsqlite3-dev                                  # the Portuguese collation registered on SQLite connections
 )
 missing=()
 for p in "${packages[@]}"; do

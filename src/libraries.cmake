@@ -8,3 +8,7 @@ find_path(LIBPQ_INCLUDE_DIR libpq-fe.h PATH_SUFFIXES postgresql REQUIRED)
 find_library(LIBPQ_LIBRARY pq REQUIRED)
 target_include_directories(quotas PRIVATE ${LIBPQ_INCLUDE_DIR})
 target_link_libraries(quotas PRIVATE ${LIBPQ_LIBRARY})
+# SQLite's own library (libsqlite3-dev): the Portuguese collation is
+# registered on the connection Qt's driver opened.
+find_package(SQLite3 REQUIRED)
+target_link_libraries(quotas PRIVATE SQLite::SQLite3)

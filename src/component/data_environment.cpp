@@ -20,13 +20,15 @@ DataEnvironment::DataEnvironment()
       Meses(QStringLiteral("Meses"), QStringLiteral("Select *, code + ' - ' + descrit as completo from tbmeses"), SqlServer),
       Extras(QStringLiteral("Extras"), QStringLiteral("SELECT * FROM Extras"), SqlServer_Prints),
       // The debt is compared in whole cents: SQLite keeps REAL amounts, where
-      // 1.10 - 0.10 is a hair above 1. Equal names keep the accounts' order.
+      // 1.10 - 0.10 is a hair above 1. Names in Portuguese order on both
+      // engines, a member without a name first; equal names keep the
+      // accounts' order.
       Dividas(QStringLiteral("Dividas"),
               QStringLiteral("select tbQuotas_Socios.*,total_quotas - total_pago as total_divida,tbSocios.no_tap,"
                              "tbsocios.nome,tbsocios.morada1,tbsocios.code_postal1 + ' ' + tbsocios.localidade1 as "
                              "Codigo_Postal from (tbQuotas_Socios left outer join tbsocios on tbquotas_socios.socio_id "
-                             "= tbsocios.socio_id) where round(total_quotas - total_pago, 2) > 1 order by tbsocios.nome, "
-                             "tbQuotas_Socios.squota_id"),
+                             "= tbsocios.socio_id) where round(total_quotas - total_pago, 2) > 1 order by tbsocios.nome "
+                             "COLLATE portugues NULLS FIRST, tbQuotas_Socios.squota_id"),
               SqlServer_Prints)
 {
 }

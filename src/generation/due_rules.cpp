@@ -13,27 +13,24 @@ const DueTypeInfo& dueTypeInfo(DueType type)
     return type == DueType::Sindicato ? sindicato : seguro;
 }
 
-bool insuranceCharged(const QVariant& seguro, const QVariant& endDate, int ano, int mes)
+bool insuranceCharged(const StoredNumber& seguro, const StoredDate& endDate, int ano, int mes)
 {
-    if (seguro.isNull() || seguro.toDouble() == 0)
+    if (!seguro.isNumber() || seguro.value == 0)
         return false;
-    if (endDate.isNull())
+    if (!endDate.date.isValid())
         return true;
-    const QDate end = endDate.toDate();
-    if (!end.isValid())
-        return true;  // no date to compare: the insurance is taken as running
-    return end.year() * 12 + end.month() >= ano * 12 + mes;
+    return endDate.date.year() * 12 + endDate.date.month() >= ano * 12 + mes;
 }
 
-std::optional<double> dueRate(const QVariant& personalRate, bool employerFound, const QVariant& employerRate)
+std::optional<double> dueRate(const StoredNumber& personalRate, bool employerFound, const StoredNumber& employerRate)
 {
-    if (!personalRate.isNull() && personalRate.toDouble() > 0)
-        return personalRate.toDouble();
+    if (personalRate.isNumber() && personalRate.value > 0)
+        return personalRate.value;
     if (!employerFound)
         return kDefaultRate;
-    if (employerRate.isNull())
+    if (!employerRate.isNumber())
         return std::nullopt;
-    return employerRate.toDouble();
+    return employerRate.value;
 }
 
 double dueAmount(double rend1, double rend2, double rate)

@@ -13,8 +13,8 @@ bool DuesAccount::lock(Connection& connection, const QVariant& socio)
     *this = DuesAccount();
     const Dialect& dialect = connection.dialect();
     QSqlQuery& q = connection.run(
-        dialect.translate(QStringLiteral("SELECT squota_id, ult_rend1, ult_rend2, ult_perc_sindicato, ult_perc_seguro "
-                                         "FROM tbQuotas_Socios WHERE (socio_id=?)")
+        dialect.translate(QStringLiteral("SELECT squota_id, ult_rend1, ult_rend2, ult_perc_sindicato, ult_perc_seguro, "
+                                         "total_quotas FROM tbQuotas_Socios WHERE (socio_id=?) ORDER BY squota_id")
                           + dialect.forUpdate()),
         {socio});
     const bool found = q.next();
@@ -24,6 +24,7 @@ bool DuesAccount::lock(Connection& connection, const QVariant& socio)
         m_rend2 = q.value(2);
         m_percSindicato = q.value(3);
         m_percSeguro = q.value(4);
+        m_total = readStoredAmount(q.value(5));
     }
     q.finish();
     return found;

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "component/stored_value.h"
 #include "generation/due_rules.h"
 
 #include <QVariant>
@@ -21,6 +22,8 @@ public:
 
     const QVariant& rend1() const { return m_rend1; }
     const QVariant& rend2() const { return m_rend2; }
+    // The account's total, as read: the charges are added to it.
+    const StoredNumber& total() const { return m_total; }
     const QVariant& personalRate(DueType type) const
     {
         return type == DueType::Sindicato ? m_percSindicato : m_percSeguro;
@@ -40,6 +43,7 @@ private:
     QVariant m_rend2;
     QVariant m_percSindicato;
     QVariant m_percSeguro;
+    StoredNumber m_total;
     double m_added = 0;
     QVariant m_quotaSindicato;  // Null: unchanged
     QVariant m_quotaSeguro;

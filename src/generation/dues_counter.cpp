@@ -5,30 +5,38 @@
 
 namespace quotas {
 
-QVariant DuesCounter::firstRow()
-{
-    return m_connection.scalar(QStringLiteral("SELECT contador_id FROM tbcontadores ORDER BY contador_id"));
-}
-
 int DuesCounter::next()
 {
-    static const QString increment =
-        QStringLiteral("UPDATE tbcontadores SET quotas = COALESCE(quotas, 0) + 1 WHERE contador_id = ? RETURNING quotas");
+    const Dialect& dialect = m_connection.dialect();
+    const QString address = dialect.rowAddress();
+    if (m_firstRow.isEmpty()) {
+        // The first row in the key's order when the table has a key, else in
+        // the order the rows were stored.
+        const QString key = m_connection.primaryKey(QStringLiteral("tbcontadores"));
+        m_firstRow = QStringLiteral("SELECT %1 FROM tbcontadores ORDER BY %2 LIMIT 1%3")
+                         .arg(address, key.isEmpty() ? address : key, dialect.forUpdate());
+    }
     for (int attempt = 0; attempt < 3; ++attempt) {
-        if (!m_row.isValid())
-            m_row = firstRow();
-        if (m_row.isValid()) {
-            const QVariant number = m_connection.scalar(increment, {m_row});
+        // Locked before it is changed: a second run waits here, and its next
+        // statement sees the number this one took.
+        const QVariant row = m_connection.scalar(m_firstRow);
+        if (row.isValid()) {
+            const QVariant number = m_connection.scalar(
+                QStringLiteral("UPDATE tbcontadores SET quotas = COALESCE(quotas, 0) + 1 WHERE %1 = CAST(? AS %2) "
+                               "RETURNING quotas")
+                    .arg(address, dialect.engine() == Engine::SQLite ? QStringLiteral("INTEGER") : QStringLiteral("tid")),
+                {row.toString()});
             if (number.isValid())
                 return number.toInt();
-            m_row = QVariant();  // the row went away since: look again
-            continue;
+            continue;  // changed by someone outside the lock: read it again
         }
-        // An empty table. The row gets a fixed key, so that a second run
-        // adding it at the same moment waits for this one and then finds it,
-        // instead of starting a second count.
-        m_connection.execute(QStringLiteral(
-            "INSERT INTO tbcontadores (contador_id, quotas) VALUES (1, 0) ON CONFLICT (contador_id) DO NOTHING"));
+        // An empty table. Those who would add the first row queue on one
+        // lock, so the second finds the row the first added.
+        m_connection.lock(Connection::LockSpace::FirstCounter);
+        if (m_connection.scalar(m_firstRow).isValid())
+            continue;
+        m_connection.execute(QStringLiteral("INSERT INTO tbcontadores (quotas) VALUES (1)"));
+        return 1;
     }
     throw DbError(QStringLiteral("Não foi possível obter o número da quota na tabela tbcontadores."));
 }

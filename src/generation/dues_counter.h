@@ -1,18 +1,19 @@
 #pragma once
 
-#include <QVariant>
+#include <QString>
 
 namespace quotas {
 
 class Connection;
 
 // The running number of the dues: column quotas of the first row of
-// tbcontadores, one number for both types, all members and all runs.
+// tbcontadores, one number for both types, all members and all runs. The
+// table may have no other column and no key.
 //
-// next() must run inside the caller's transaction: the increment is one
-// atomic statement whose row lock (PostgreSQL) lasts until that transaction
-// ends, so two runs at once never hand out the same number, and a rolled
-// back posting gives its number back.
+// next() must run inside the caller's transaction: the counter row is read
+// with a lock (PostgreSQL) or under the writer lock (SQLite) that lasts until
+// that transaction ends, so two runs at once never hand out the same number,
+// and a rolled back posting gives its number back.
 class DuesCounter {
 public:
     explicit DuesCounter(Connection& connection) : m_connection(connection) {}
@@ -22,10 +23,8 @@ public:
     int next();
 
 private:
-    QVariant firstRow();
-
     Connection& m_connection;
-    QVariant m_row;  // contador_id of the counter row, once known
+    QString m_firstRow;  // the locking read of the first row's address
 };
 
 }  // namespace quotas

@@ -37,6 +37,10 @@ QString GenerationOutcome::summary() const
         lines << QStringLiteral("- %1 porque a empresa do associado não tem a percentagem de quotização "
                                 "(Nº Empresa: %2);")
                      .arg(dues(missingRate), listed(membersMissingRate));
+    if (unreadable > 0)
+        lines << QStringLiteral("- %1 porque um valor guardado não é um número válido ou a data não é legível "
+                                "(Nº Empresa: %2);")
+                     .arg(dues(unreadable), listed(membersUnreadable));
     lines << QStringLiteral("Corrija estes valores e volte a gerar o mesmo mês: as quotas já geradas não se repetem.");
     return lines.join(u'\n');
 }

@@ -18,8 +18,14 @@ struct GenerationOutcome {
     // once each, in the order met.
     QStringList membersMissingRemuneration;
     QStringList membersMissingRate;
+    // Dues not posted because a value they are computed from is not a
+    // finite number within range, or the insurance end date is not a date;
+    // each member once, with the column and the value ("1234 (ult_rend1:
+    // valor ilegível (abc))").
+    int unreadable = 0;
+    QStringList membersUnreadable;
 
-    int notGenerated() const { return missingRemuneration + missingRate; }
+    int notGenerated() const { return missingRemuneration + missingRate + unreadable; }
     // The Portuguese account of the dues not generated and why; empty when
     // every due could be posted.
     QString summary() const;

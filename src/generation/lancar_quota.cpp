@@ -1,6 +1,7 @@
 #include "generation/lancar_quota.h"
 
 #include "component/money.h"
+#include "component/stored_value.h"
 #include "generation/dues_account.h"
 #include "generation/dues_counter.h"
 #include "generation/generation_outcome.h"
@@ -50,36 +51,64 @@ bool LancarQuota(PostingContext& ctx, DueType type)
     if (ctx.charged & (1u << info.tipo))
         return false;
 
-    if (type == DueType::Seguro
-        && !insuranceCharged(ctx.member.value(QStringLiteral("seguro")),
-                             ctx.member.value(QStringLiteral("seguro_data_rescisao")), ctx.ano, ctx.mes))
+    // A value that is not what its column promises leaves the due out,
+    // named; it is never taken as 0 or as "no end date".
+    auto unreadable = [&](const QString& column, const QString& problem) {
+        ++ctx.outcome.unreadable;
+        noteOnce(ctx.outcome.membersUnreadable,
+                 QStringLiteral("%1 (%2: %3)").arg(memberLabel(ctx.member), column, problem));
         return false;
+    };
 
-    if (ctx.account.rend1().isNull() || ctx.account.rend2().isNull()) {
+    if (type == DueType::Seguro) {
+        const StoredNumber seguro = readStoredNumber(ctx.member.value(QStringLiteral("seguro")));
+        if (seguro.isBad())
+            return unreadable(QStringLiteral("seguro"), seguro.problem());
+        const StoredDate end = readStoredDate(ctx.member.value(QStringLiteral("seguro_data_rescisao")));
+        if (!end.ok && seguro.value != 0)
+            return unreadable(QStringLiteral("seguro_data_rescisao"), end.problem());
+        if (!insuranceCharged(seguro, end, ctx.ano, ctx.mes))
+            return false;
+    }
+
+    const StoredNumber rend1 = readStoredAmount(ctx.account.rend1());
+    const StoredNumber rend2 = readStoredAmount(ctx.account.rend2());
+    if (rend1.isBad())
+        return unreadable(QStringLiteral("ult_rend1"), rend1.problem());
+    if (rend2.isBad())
+        return unreadable(QStringLiteral("ult_rend2"), rend2.problem());
+    if (ctx.account.total().isBad())
+        return unreadable(QStringLiteral("total_quotas"), ctx.account.total().problem());
+    if (rend1.isNull() || rend2.isNull()) {
         ++ctx.outcome.missingRemuneration;
         noteOnce(ctx.outcome.membersMissingRemuneration, memberLabel(ctx.member));
         return false;
     }
 
+    const StoredNumber personal = readStoredNumber(ctx.account.personalRate(type));
+    if (personal.isBad())
+        return unreadable(info.personalRate, personal.problem());
     ctx.employers.moveFirst();
     const bool employerFound = ctx.employers.find(QStringLiteral("code"), ctx.member.value(QStringLiteral("empresa")));
-    const std::optional<double> rate =
-        dueRate(ctx.account.personalRate(type), employerFound,
-                employerFound ? ctx.employers.value(QStringLiteral("percent_sindicato")) : QVariant());
+    const StoredNumber employer =
+        readStoredNumber(employerFound ? ctx.employers.value(QStringLiteral("percent_sindicato")) : QVariant());
+    if (employer.isBad() && !(personal.isNumber() && personal.value > 0))
+        return unreadable(QStringLiteral("percent_sindicato"), employer.problem());
+    const std::optional<double> rate = dueRate(personal, employerFound, employer);
     if (!rate) {
         ++ctx.outcome.missingRate;
         noteOnce(ctx.outcome.membersMissingRate, memberLabel(ctx.member));
         return false;
     }
 
-    const double rend1 = roundCents(ctx.account.rend1().toDouble());
-    const double rend2 = roundCents(ctx.account.rend2().toDouble());
-    const double amount = dueAmount(rend1, rend2, *rate);
+    const double amount = dueAmount(roundCents(rend1.value), roundCents(rend2.value), *rate);
+    if (!amountInRange(amount))
+        return unreadable(QStringLiteral("quota"), QStringLiteral("valor calculado fora dos limites de ±9.999.999.999,99"));
     const int number = ctx.counter.next();
     ctx.connection.execute(QStringLiteral("INSERT INTO tbQuotas_Movimentos (data, ano, mes, socio_id, ref, rend1, rend2, "
                                           "quota, pago, tipo, quota_no) VALUES (?, ?, ?, ?, ?, ?, ?, ?, 0, ?, ?)"),
-                           {ctx.today, ctx.ano, ctx.mes, ctx.member.value(QStringLiteral("no")), info.ref, rend1, rend2,
-                            amount, info.tipo, number});
+                           {ctx.today, ctx.ano, ctx.mes, ctx.member.value(QStringLiteral("no")), info.ref,
+                            roundCents(rend1.value), roundCents(rend2.value), amount, info.tipo, number});
     ctx.account.charge(type, amount, ctx.ano, ctx.mes);
     ctx.charged |= 1u << info.tipo;
     ++ctx.outcome.posted;

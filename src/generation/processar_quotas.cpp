@@ -2,6 +2,7 @@
 
 #include "component/money.h"
 #include "component/shared_objects.h"
+#include "component/stored_value.h"
 #include "generation/dues_account.h"
 #include "generation/dues_counter.h"
 #include "generation/due_rules.h"
@@ -32,7 +33,7 @@ const QString kMembersSql = QStringLiteral(
     "FROM tbsocios s WHERE s.socio_id <= ?%1 ORDER BY s.socio_id");
 const QString kNewAccountSql = QStringLiteral(
     "INSERT INTO tbQuotas_Socios (socio_id, ult_ano, ult_mes, ult_rend1, ult_rend2, ult_quota_sindicato, "
-    "ult_quota_seguro, total_quotas, total_pago) VALUES (?,?,?,?,0,0,0,0,0) ON CONFLICT (socio_id) DO NOTHING");
+    "ult_quota_seguro, total_quotas, total_pago) VALUES (?,?,?,?,0,0,0,0,0)");
 
 // A member whose category is not known starts from this remuneration.
 constexpr double kUnknownCategoryRend1 = 100000;
@@ -78,10 +79,10 @@ public:
         }
         Transaction tx(m_connection);
         const QVariant no = member.value(QStringLiteral("no"));
-        if (member.isNull(QStringLiteral("squota_id")))
-            createAccount(member);
+        // Whatever indexes the tables have, a second run visiting the member
+        // waits here, then finds the account and the dues this one wrote.
+        m_connection.lockMember(no);
         if (!m_account.lock(m_connection, no)) {
-            // Deleted since the members were read.
             createAccount(member);
             if (!m_account.lock(m_connection, no))
                 throw DbError(QStringLiteral("Não foi possível criar a conta de quotas do associado."));
@@ -111,13 +112,12 @@ private:
         QVariant rend1 = kUnknownCategoryRend1;
         m_categories.moveFirst();
         if (m_categories.find(QStringLiteral("code"), member.value(QStringLiteral("fuv")))) {
-            const QVariant categoryRend1 = m_categories.value(QStringLiteral("rend1"));
-            // A category without remuneration leaves the account without
-            // one: its dues are reported, never computed from nothing.
-            rend1 = categoryRend1.isNull() ? QVariant(QMetaType::fromType<double>())
-                                           : QVariant(roundCents(categoryRend1.toDouble()));
+            const StoredNumber categoryRend1 = readStoredAmount(m_categories.value(QStringLiteral("rend1")));
+            // A category without a usable remuneration leaves the account
+            // without one: its dues are reported, never computed from nothing.
+            rend1 = categoryRend1.isNumber() ? QVariant(roundCents(categoryRend1.value))
+                                             : QVariant(QMetaType::fromType<double>());
         }
-        // When a second run created the account first, nothing is inserted.
         m_outcome.accountsCreated +=
             m_connection.execute(kNewAccountSql, {member.value(QStringLiteral("no")), m_ano, m_mes, rend1});
     }

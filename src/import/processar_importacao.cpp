@@ -3,6 +3,7 @@
 #include "component/money.h"
 #include "component/month_names.h"
 #include "component/shared_objects.h"
+#include "component/stored_value.h"
 #include "generation/substituir_caracter.h"
 #include "import/import_recordset.h"
 #include "import/import_verdict.h"
@@ -67,12 +68,6 @@ qint64 cents(double amount)
     return std::llround(amount * 100.0);
 }
 
-// A stored amount; Null counts as 0, as it does once the maintenance has run.
-double amountOf(const QVariant& value)
-{
-    return value.isNull() ? 0.0 : value.toDouble();
-}
-
 // An imported amount: "." and "," both read as the decimal separator, whole
 // cents when the source carries no separator. Nothing when the value is not
 // a number.
@@ -83,7 +78,10 @@ std::optional<double> readAmount(const QVariant& value, bool wholeCents)
     const std::optional<double> number = parseDecimal(SubstituirCaracter(value, QStringLiteral("."), QStringLiteral(",")));
     if (!number)
         return std::nullopt;
-    return roundCents(wholeCents ? *number / 100.0 : *number);
+    const double amount = roundCents(wholeCents ? *number / 100.0 : *number);
+    if (!amountInRange(amount))
+        return std::nullopt;
+    return amount;
 }
 
 using Outcome = ImportVerdict::Kind;
@@ -133,11 +131,15 @@ struct Lines {
         movements.moveFirst();
         if (key.isNull() || !movements.find(QStringLiteral("no_tap"), key.toString()))
             return decided(Outcome::Reject, QStringLiteral("sem quota gerada"));
-        const double charged = amountOf(movementAmount(QStringLiteral("quota")));
-        const bool unpaid = cents(amountOf(movementAmount(QStringLiteral("pago")))) == 0;
+        // A Null pago is not 0 and a Null quota is not below q: compared with
+        // Null, the line is left alone.
+        const StoredNumber quota = readStoredAmount(movementAmount(QStringLiteral("quota")));
+        const StoredNumber pago = readStoredAmount(movementAmount(QStringLiteral("pago")));
+        const double charged = quota.isNumber() ? quota.value : 0.0;
+        const bool unpaid = pago.isNumber() && cents(pago.value) == 0;
         verdict.matched = true;
         verdict.quotaBefore = cents(charged);
-        verdict.pagoBefore = cents(amountOf(movementAmount(QStringLiteral("pago"))));
+        verdict.pagoBefore = cents(pago.isNumber() ? pago.value : 0.0);
         // The account of the member whose movement was found, so that a staff
         // number two members share can never split one line between them.
         accounts.moveFirst();
@@ -154,7 +156,15 @@ struct Lines {
                 return decided(Outcome::Reject, QStringLiteral("valor ilegível"));
         }
 
-        if (!((unpaid && cents(*q) != 0) || cents(*q) > cents(charged)))
+        // What the line is compared with and added to must be numbers.
+        for (const QVariant& stored :
+             {movementAmount(QStringLiteral("quota")), movementAmount(QStringLiteral("pago")),
+              accounts.value(QStringLiteral("ult_rend1")), accounts.value(QStringLiteral("ult_rend2")),
+              accounts.value(QStringLiteral("total_quotas")), accounts.value(QStringLiteral("total_pago"))}) {
+            if (readStoredAmount(stored).isBad())
+                return decided(Outcome::Reject, QStringLiteral("valor ilegível na base de dados"));
+        }
+        if (!((unpaid && cents(*q) != 0) || (quota.isNumber() && cents(*q) > cents(charged))))
             return decided(Outcome::LeaveAlone, unpaid ? QStringLiteral("desconto de 0,00") : QStringLiteral("já registada"));
         decided(Outcome::Post);
         verdict.quotaAfter = verdict.pagoAfter = cents(*q);
@@ -174,8 +184,9 @@ struct Lines {
             accounts.setValue(QStringLiteral("ult_rend1"), *r);
             accounts.setValue(QStringLiteral("ult_rend2"), 0.0);
         }
-        const double base = amountOf(accounts.value(QStringLiteral("ult_rend1")))
-                            + amountOf(accounts.value(QStringLiteral("ult_rend2")));
+        const double base = r ? *r
+                              : readStoredAmount(accounts.value(QStringLiteral("ult_rend1"))).value
+                                    + readStoredAmount(accounts.value(QStringLiteral("ult_rend2"))).value;
         const QString due = tipo == 1 ? QStringLiteral("ult_quota_sindicato") : QStringLiteral("ult_quota_seguro");
         const QString rate = tipo == 1 ? QStringLiteral("ult_perc_sindicato") : QStringLiteral("ult_perc_seguro");
         accounts.setValue(due, *q);

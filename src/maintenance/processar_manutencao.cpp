@@ -2,6 +2,7 @@
 
 #include "component/installation.h"
 #include "component/money.h"
+#include "component/stored_value.h"
 #include "maintenance/maintenance_panel.h"
 #include "platform/chunked_rows.h"
 #include "platform/components.h"
@@ -82,8 +83,17 @@ void repairNulls(Connection& connection, MaintenancePanel& panel, int pass, cons
                      key, key, {last});
     for (; !work.eof(); work.moveNext()) {
         bool hasNull = false;
-        for (int column = 1; column <= 4; ++column)
-            hasNull = hasNull || work.value(column).isNull();
+        for (int column = 1; column <= 4; ++column) {
+            // The totals are summed from these columns: a value that is not a
+            // number would enter them as 0 or as infinity.
+            const StoredNumber amount = readStoredAmount(work.value(column));
+            if (amount.isBad())
+                throw QuotasError(QStringLiteral("na tabela %1, o movimento com %2 %3 tem na coluna %4 um %5. "
+                                                 "Corrija esse valor.")
+                                      .arg(table, key, work.value(0).toString(), work.fieldName(column).toLower(),
+                                           amount.problem()));
+            hasNull = hasNull || amount.isNull();
+        }
         if (hasNull)
             connection.execute(repair, {work.value(0)});
         panel.stepBar(pass);
@@ -94,9 +104,10 @@ void repairNulls(Connection& connection, MaintenancePanel& panel, int pass, cons
 // together, so that a failure half-way leaves the totals as they were rather
 // than at 0, which would show every member as paid up. The grouped sums are
 // read in chunks in the order of socio_id; each goes to the member's first
-// account, or to a new one when he has none.
-void rebuildTotals(Connection& connection, MaintenancePanel& panel, int pass, const TotalsPass& what, QObject* progress,
-                   bool& progressShown)
+// account, or to a new one when he has none. Movements without a member
+// enter no account; returns how many there were.
+int rebuildTotals(Connection& connection, MaintenancePanel& panel, int pass, const TotalsPass& what, QObject* progress,
+                  bool& progressShown)
 {
     callByName(progress, "Iniciar", {2, QString::fromUtf8(kFetching), panel.caption()});
     progressShown = true;
@@ -132,12 +143,20 @@ void rebuildTotals(Connection& connection, MaintenancePanel& panel, int pass, co
             // SQLite adds REALs in binary: the sums carry stray fractions of a cent.
             const double quotas = roundCents(groups.value(1).toDouble());
             const double pago = roundCents(groups.value(2).toDouble());
-            if (connection.execute(toFirstAccount, {quotas, pago, socio}) == 0)
-                connection.execute(newAccount, {socio, quotas, pago});
+            if (connection.execute(toFirstAccount, {quotas, pago, socio}) == 0) {
+                // A run that reached the member meanwhile may be giving him
+                // an account: wait for it, and keep that one.
+                connection.lockMember(socio);
+                if (connection.execute(toFirstAccount, {quotas, pago, socio}) == 0)
+                    connection.execute(newAccount, {socio, quotas, pago});
+            }
             panel.stepBar(pass);
         }
     }
+    const int withoutMember =
+        connection.scalar(QStringLiteral("SELECT COUNT(*) FROM %1 WHERE socio_id IS NULL").arg(movements)).toInt();
     tx.commit();
+    return withoutMember;
 }
 
 QString reasonOf(const std::exception& e)
@@ -149,8 +168,9 @@ QString reasonOf(const std::exception& e)
 
 }  // namespace
 
-void ProcessarManutencao(Connection& connection, MaintenancePanel& panel)
+int ProcessarManutencao(Connection& connection, MaintenancePanel& panel)
 {
+    int withoutMember = 0;
     std::unique_ptr<QObject> progress;
     try {
         progress = createComponent(QStringLiteral("Velumo.General"));
@@ -190,7 +210,7 @@ void ProcessarManutencao(Connection& connection, MaintenancePanel& panel)
         totals = true;
         for (const TotalsPass& what : kTotalsPasses) {
             stage = QString::fromUtf8(what.label);
-            rebuildTotals(connection, panel, pass++, what, progress.get(), progressShown);
+            withoutMember += rebuildTotals(connection, panel, pass++, what, progress.get(), progressShown);
         }
         lazy.finish();
     } catch (const std::exception& e) {
@@ -204,6 +224,11 @@ void ProcessarManutencao(Connection& connection, MaintenancePanel& panel)
     panel.stopAnimation();
     msgBox(QStringLiteral("Manutenção de Dados Concluída."), Buttons::Ok, Icon::Information,
            QStringLiteral("Manutenção"));
+    if (withoutMember > 0)
+        msgBox(QStringLiteral("%1 movimentos sem associado (socio_id vazio) ficaram fora dos acumulados.")
+                   .arg(withoutMember),
+               Buttons::Ok, Icon::Exclamation, QStringLiteral("Manutenção"));
+    return withoutMember;
 }
 
 }  // namespace quotas

@@ -23,6 +23,10 @@ class MaintenancePanel;
 // stops, the buttons stay as they were and QuotasError is thrown with a
 // Portuguese message saying where the maintenance stopped and why; what was
 // saved before stays saved.
-void ProcessarManutencao(Connection& connection, MaintenancePanel& panel);
+//
+// Movements without a member (socio_id Null) enter no total and create no
+// account; a box after the closing one says how many were left out, and that
+// count is returned.
+int ProcessarManutencao(Connection& connection, MaintenancePanel& panel);
 
 }  // namespace quotas

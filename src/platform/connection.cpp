@@ -2,6 +2,7 @@
 
 #include "platform/connection_string.h"
 #include "platform/errors.h"
+#include "platform/sqlite_collation.h"
 #include "platform/transaction.h"
 
 #include <QAtomicInt>
@@ -109,6 +110,12 @@ void Connection::open(OpenMode mode)
             QSqlDatabase::removeDatabase(dbName);
             throw DbError(QStringLiteral("Não foi possível abrir a base de dados (%1): %2")
                               .arg(target.engine == Engine::SQLite ? target.file : target.host, reason.trimmed()));
+        }
+        if (target.engine == Engine::SQLite && !registerPortugueseCollation(db)) {
+            db.close();
+            db = QSqlDatabase();
+            QSqlDatabase::removeDatabase(dbName);
+            throw DbError(QStringLiteral("Não foi possível preparar a ordenação portuguesa na base de dados."));
         }
         for (const QString& statement : setup) {
             QSqlQuery q(db);
@@ -258,6 +265,20 @@ bool Connection::hasTable(const QString& table)
             return true;
     }
     return false;
+}
+
+void Connection::lock(LockSpace space, qint64 key)
+{
+    if (m_depth == 0)
+        throw DbError(QStringLiteral("Um bloqueio só pode ser pedido dentro de uma transacção."));
+    const QString sql = dialect().transactionLock();
+    if (sql.isEmpty())
+        return;
+    // The lock takes 32-bit numbers: keys 2^32 apart share a lock, which
+    // costs a wait at most.
+    const qint32 low = qint32(quint32(quint64(key) & 0xffffffffu));
+    QSqlQuery& q = run(sql, {qint32(space), low});
+    q.finish();
 }
 
 void Connection::begin()

@@ -84,6 +84,17 @@ public:
     QString primaryKey(const QString& table);
     bool hasTable(const QString& table);
 
+    // What a transaction can hold to itself, beyond rows: a member's account
+    // and dues, or the adding of the first counter row.
+    enum class LockSpace {
+        Member = 1364283221,
+        FirstCounter = 1364283222
+    };
+    // Within a transaction: waits until no other transaction holds the same
+    // lock, and keeps it until this one ends.
+    void lock(LockSpace space, qint64 key = 0);
+    void lockMember(const QVariant& socio) { lock(LockSpace::Member, socio.toLongLong()); }
+
     // Transactions nest: an inner one is a savepoint of the outer one.
     // Prefer the Transaction guard to calling these directly.
     void begin();

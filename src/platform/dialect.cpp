@@ -86,6 +86,15 @@ QString Dialect::translate(const QString& sql) const
     if (cached != m_translated.constEnd())
         return *cached;
     QString out;
+    if (m_engine == Engine::PostgreSQL && sql.contains(QStringLiteral("COLLATE portugues"))) {
+        // The server's ICU collation for Portuguese (Portugal), whatever the
+        // database's own locale.
+        QString withCollation = sql;
+        withCollation.replace(QStringLiteral("COLLATE portugues"), QStringLiteral("COLLATE \"pt-PT-x-icu\""));
+        out = translate(withCollation);
+        m_translated.insert(sql, out);
+        return out;
+    }
     if (!sql.contains(u'+')) {
         out = sql;
     } else {
@@ -144,6 +153,16 @@ QString Dialect::addToColumn(const QString& column) const
 QString Dialect::forUpdate() const
 {
     return m_engine == Engine::SQLite ? QString() : QStringLiteral(" FOR UPDATE");
+}
+
+QString Dialect::transactionLock() const
+{
+    return m_engine == Engine::SQLite ? QString() : QStringLiteral("SELECT pg_advisory_xact_lock(?, ?)");
+}
+
+QString Dialect::rowAddress() const
+{
+    return m_engine == Engine::SQLite ? QStringLiteral("rowid") : QStringLiteral("ctid");
 }
 
 QString Dialect::catalogName(const QString& table) const

@@ -21,7 +21,9 @@ public:
 
     // String concatenation is written "a + ' ' + b" in the system's texts;
     // both engines want "||". A "+" is rewritten when an operand beside it is
-    // a string literal, so arithmetic stays untouched.
+    // a string literal, so arithmetic stays untouched. "COLLATE portugues"
+    // (Portuguese order) is SQLite's collation of that name, registered on
+    // the connection, and the server's ICU collation on PostgreSQL.
     QString translate(const QString& sql) const;
 
     QString beginTransaction() const;
@@ -40,6 +42,13 @@ public:
     // Appended to a SELECT that must lock the rows it reads until the
     // transaction ends (SQLite's writer lock already serialises writers).
     QString forUpdate() const;
+    // A statement taking a lock on two numbers (what is locked, and which
+    // one) until the transaction ends, whatever indexes the tables have: an
+    // advisory lock on PostgreSQL; nothing on SQLite, whose BEGIN IMMEDIATE
+    // already holds the one writer lock.
+    QString transactionLock() const;
+    // The column that addresses a row of a table that may have no key.
+    QString rowAddress() const;
     // How the engine's catalogue spells an unquoted table name.
     QString catalogName(const QString& table) const;
 

@@ -64,17 +64,23 @@ void Recordset::open(const QString& sql, Connection& connection, Cursor cursor, 
     }
     m_columns = std::move(columns);
     const int n = fieldCount();
-    for (int i = 0; i < n; ++i)
-        m_byName.insert(m_columns[size_t(i)].name.toLower(), i);
+    // A join may return two columns of one name: the first one is the field.
+    for (int i = 0; i < n; ++i) {
+        const QString name = m_columns[size_t(i)].name.toLower();
+        if (!m_byName.contains(name))
+            m_byName.insert(name, i);
+    }
     // Integer-valued amounts come back from SQLite as integers; keep every
-    // value of a column in the column's type.
+    // number of a column in the column's type. A text SQLite kept in a
+    // number column stays text, so that it is reported rather than read as 0.
     std::vector<bool> wantsDouble(static_cast<size_t>(n));
     for (int i = 0; i < n; ++i)
         wantsDouble[size_t(i)] = m_columns[size_t(i)].type.id() == QMetaType::Double;
     while (q.next()) {
         for (int i = 0; i < n; ++i) {
             QVariant v = q.value(i);
-            if (wantsDouble[size_t(i)] && !v.isNull() && v.metaType().id() != QMetaType::Double)
+            if (wantsDouble[size_t(i)] && !v.isNull() && v.metaType().id() != QMetaType::Double
+                && isNumericType(v.metaType()))
                 v = QVariant(v.toDouble());
             m_cells.append(std::move(v));
         }
@@ -94,7 +100,8 @@ void Recordset::openInMemory(const QStringList& columns)
 {
     close();
     for (const QString& name : columns) {
-        m_byName.insert(name.toLower(), int(m_columns.size()));
+        if (!m_byName.contains(name.toLower()))
+            m_byName.insert(name.toLower(), int(m_columns.size()));
         m_columns.push_back({name, QString(), QMetaType::fromType<QString>()});
     }
     m_open = true;

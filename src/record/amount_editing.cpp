@@ -6,6 +6,7 @@
 #include "record/frm_quota.h"
 
 #include "component/money.h"
+#include "component/stored_value.h"
 #include "platform/message_boxes.h"
 #include "platform/recordset.h"
 #include "record/record_text.h"
@@ -78,7 +79,7 @@ bool FrmQuota::eventFilter(QObject* watched, QEvent* event)
         if (field != Text8) {
             guarded([&] {
                 const QVariant value = Adodc1->value(field == Text5 ? QStringLiteral("rend1") : QStringLiteral("rend2"));
-                field->setText(value.isNull() ? QString() : formatMoney(value.toDouble()));
+                field->setText(amountText(value));
             });
         }
         m_validating = false;
@@ -99,7 +100,9 @@ void FrmQuota::enterField(QLineEdit* field)
     if (field != Text8) {
         // The user edits the number itself, not its money format.
         const QVariant value = Adodc1->value(field == Text5 ? QStringLiteral("rend1") : QStringLiteral("rend2"));
-        field->setText(value.isNull() ? QString() : plainNumber(value.toDouble()));
+        const StoredNumber stored = readStoredAmount(value);
+        field->setText(stored.isNumber() ? plainNumber(stored.value) : stored.isNull() ? QString()
+                                                                                       : value.toString());
     }
     field->setSelection(0, int(field->text().size()));
     m_textOnEnter.insert(field, field->text());
@@ -126,24 +129,26 @@ double FrmQuota::participation() const
     if (const std::optional<double> typed = parseDecimal(Text8->text()))
         return *typed;
     // Before the refresh has filled the field: the participation it will show.
-    const double remunerations = amountOf(Adodc1->value(QStringLiteral("rend1")))
-                                 + amountOf(Adodc1->value(QStringLiteral("rend2")));
+    const double remunerations = amountOf(Adodc1->value(QStringLiteral("rend1")), QStringLiteral("rend1"))
+                                 + amountOf(Adodc1->value(QStringLiteral("rend2")), QStringLiteral("rend2"));
     if (remunerations == 0.0)
         return 0.0;
-    return roundHalfEven(amountOf(Adodc1->value(QStringLiteral("quota"))) / remunerations, 5);
+    return roundHalfEven(amountOf(Adodc1->value(QStringLiteral("quota")), QStringLiteral("quota")) / remunerations, 5);
 }
 
 QString FrmQuota::leaveRemuneration(QLineEdit* field, const QString& column, const QString& otherColumn)
 {
     const std::optional<double> typed = parseDecimal(field->text());
-    if (!typed)
+    if (!typed || !amountInRange(*typed))
         return invalidValue();
     // The due is computed from the remuneration as it will be stored.
     const double remuneration = roundCents(*typed);
-    const double due = (remuneration + amountOf(Adodc1->value(otherColumn))) * participation();
+    const double due = (remuneration + amountOf(Adodc1->value(otherColumn), otherColumn)) * participation();
+    if (!amountInRange(due))
+        return invalidValue();
     // Compared unrounded: a due that only rounding lifts to the paid part
     // is still below it.
-    if (!(due >= amountOf(Adodc1->value(QStringLiteral("pago")))))
+    if (!(due >= amountOf(Adodc1->value(QStringLiteral("pago")), QStringLiteral("pago"))))
         return belowPaid();
     Adodc1->setValue(column, remuneration);
     Adodc1->setValue(QStringLiteral("quota"), roundCents(due));
@@ -158,8 +163,10 @@ QString FrmQuota::leaveParticipation()
     if (!typed)
         return invalidValue();
     // Not held against the paid part: a lower due shows as an overpayment.
-    const double remunerations = amountOf(Adodc1->value(QStringLiteral("rend1")))
-                                 + amountOf(Adodc1->value(QStringLiteral("rend2")));
+    const double remunerations = amountOf(Adodc1->value(QStringLiteral("rend1")), QStringLiteral("rend1"))
+                                 + amountOf(Adodc1->value(QStringLiteral("rend2")), QStringLiteral("rend2"));
+    if (!amountInRange(remunerations * *typed))
+        return invalidValue();
     Adodc1->setValue(QStringLiteral("quota"), roundCents(remunerations * *typed));
     showDue();
     showPorLiquidar();

@@ -85,10 +85,7 @@ void FrmQuota::showRow()
     const Recordset& row = *Adodc1;
     const QLocale locale;
     auto plain = [&](const char* column) { return row.value(QLatin1String(column)).toString(); };
-    auto money = [&](const char* column) {
-        const QVariant v = row.value(QLatin1String(column));
-        return v.isNull() ? QString() : formatMoney(v.toDouble(), locale);
-    };
+    auto money = [&](const char* column) { return amountText(row.value(QLatin1String(column)), locale); };
     Text1->setText(formatDataQuota(row.value(QStringLiteral("data"))));
     Text2->setText(plain("ano"));
     Text3->setText(plain("mes"));
@@ -105,13 +102,13 @@ void FrmQuota::showRow()
 void FrmQuota::showDue()
 {
     const QVariant quota = Adodc1->value(QStringLiteral("quota"));
-    Text9->setText(quota.isNull() ? QString() : formatMoney(quota.toDouble()));
+    Text9->setText(amountText(quota));
 }
 
 void FrmQuota::showPorLiquidar()
 {
-    const double quota = amountOf(Adodc1->value(QStringLiteral("quota")));
-    const double pago = amountOf(Adodc1->value(QStringLiteral("pago")));
+    const double quota = amountOf(Adodc1->value(QStringLiteral("quota")), QStringLiteral("quota"));
+    const double pago = amountOf(Adodc1->value(QStringLiteral("pago")), QStringLiteral("pago"));
     Text13->setText(formatMoney(roundCents(quota - pago)));
 }
 
@@ -120,9 +117,9 @@ void FrmQuota::Timer1_Timer()
     Timer1->stop();
     if (!Adodc1)
         return;
-    const double remunerations = amountOf(Adodc1->value(QStringLiteral("rend1")))
-                                 + amountOf(Adodc1->value(QStringLiteral("rend2")));
-    Text8->setText(participationText(amountOf(Adodc1->value(QStringLiteral("quota"))), remunerations));
+    const double remunerations = amountOf(Adodc1->value(QStringLiteral("rend1")), QStringLiteral("rend1"))
+                                 + amountOf(Adodc1->value(QStringLiteral("rend2")), QStringLiteral("rend2"));
+    Text8->setText(participationText(amountOf(Adodc1->value(QStringLiteral("quota")), QStringLiteral("quota")), remunerations));
     showPorLiquidar();
 }
 

@@ -106,45 +106,53 @@ void gravarQuota(Recordset& movement, const QVariantList& accountAsRead)
     const QVariant rend1 = movement.value(QStringLiteral("rend1"));
     const QVariant rend2 = movement.value(QStringLiteral("rend2"));
     const QVariant quota = movement.value(QStringLiteral("quota"));
-    const double remunerations = amountOf(rend1) + amountOf(rend2);
+    // Read first: a value that is not a number stops the save before anything is written.
+    const double remunerations = amountOf(rend1, QStringLiteral("rend1")) + amountOf(rend2, QStringLiteral("rend2"));
+    const double due = amountOf(quota, QStringLiteral("quota"));
     // Without remunerations there is no rate to derive; 0 is what the window
     // shows for it, and a rate of 0 makes the next generation use the
     // employer's rate rather than a personal one.
     QVariant rate;
     if (!quota.isNull())
-        rate = remunerations == 0.0 ? 0.0 : quota.toDouble() / remunerations;
+        rate = remunerations == 0.0 ? 0.0 : due / remunerations;
 
     Transaction tx(connection);
-    Recordset account;
-    account.open(QStringLiteral("Select * from tbQuotas_Socios where socio_id=?"), connection, Cursor::Keyset,
-                 Lock::Optimistic, {socio});
-    // An account whose last values another user changed since the window
-    // read them is not overwritten; one that has gone is made again. Every
-    // last value is guarded, so the save checks them all once more.
-    if (!account.eof()) {
-        if (!sameLastValues(lastValuesOf(account), accountAsRead))
-            throw ConcurrencyError(QStringLiteral("A conta do associado foi alterada por outro utilizador depois de lida. "
-                                                  "As alterações não foram gravadas."));
-        for (const QString& column : accountLastColumns())
-            account.setValue(column, account.value(column));
+    // A movement of no member belongs to no account.
+    if (!socio.isNull()) {
+        // A generation reaching the member meanwhile waits, and then finds
+        // the account this save creates instead of adding a second one.
+        connection.lockMember(socio);
+        Recordset account;
+        account.open(QStringLiteral("Select * from tbQuotas_Socios where socio_id=?"), connection, Cursor::Keyset,
+                     Lock::Optimistic, {socio});
+        // An account whose last values another user changed since the window
+        // read them is not overwritten; one that has gone is made again. Every
+        // last value is guarded, so the save checks them all once more.
+        if (!account.eof()) {
+            if (!sameLastValues(lastValuesOf(account), accountAsRead))
+                throw ConcurrencyError(QStringLiteral("A conta do associado foi alterada por outro utilizador depois de lida. "
+                                                      "As alterações não foram gravadas."));
+            for (const QString& column : accountLastColumns())
+                account.setValue(column, account.value(column));
+        }
+        if (account.eof()) {
+            account.addNew();
+            account.setValue(QStringLiteral("socio_id"), socio);
+            account.setValue(QStringLiteral("ult_ano"), movement.value(QStringLiteral("ano")));
+            account.setValue(QStringLiteral("ult_mes"), movement.value(QStringLiteral("mes")));
+        }
+        account.setValue(QStringLiteral("ult_rend1"), cents(rend1));
+        account.setValue(QStringLiteral("ult_rend2"), cents(rend2));
+        if (movement.value(QStringLiteral("ref")).toString() == QLatin1String("Sindicato")) {
+            account.setValue(QStringLiteral("ult_quota_sindicato"), cents(quota));
+            account.setValue(QStringLiteral("ult_perc_sindicato"), rate);
+        } else {
+            account.setValue(QStringLiteral("ult_quota_seguro"), cents(quota));
+            account.setValue(QStringLiteral("ult_perc_seguro"), rate);
+        }
+        account.update();
+        account.close();
     }
-    if (account.eof()) {
-        account.addNew();
-        account.setValue(QStringLiteral("socio_id"), socio);
-        account.setValue(QStringLiteral("ult_ano"), movement.value(QStringLiteral("ano")));
-        account.setValue(QStringLiteral("ult_mes"), movement.value(QStringLiteral("mes")));
-    }
-    account.setValue(QStringLiteral("ult_rend1"), cents(rend1));
-    account.setValue(QStringLiteral("ult_rend2"), cents(rend2));
-    if (movement.value(QStringLiteral("ref")).toString() == QLatin1String("Sindicato")) {
-        account.setValue(QStringLiteral("ult_quota_sindicato"), cents(quota));
-        account.setValue(QStringLiteral("ult_perc_sindicato"), rate);
-    } else {
-        account.setValue(QStringLiteral("ult_quota_seguro"), cents(quota));
-        account.setValue(QStringLiteral("ult_perc_seguro"), rate);
-    }
-    account.update();
-    account.close();
 
     guardWholeRow(movement);
     movement.update();
@@ -170,7 +178,7 @@ void liquidarQuota(Recordset& movement, double amount, const QString& document)
         account.close();
 
         guardWholeRow(movement);
-        movement.setValue(QStringLiteral("pago"), roundCents(amountOf(pagoBefore) + paid));
+        movement.setValue(QStringLiteral("pago"), roundCents(amountOf(pagoBefore, QStringLiteral("pago")) + paid));
         // A cancelled document box leaves an empty text, not Null.
         movement.setValue(QStringLiteral("doc_no"), document.isNull() ? QString(QLatin1String("")) : document);
         movement.update();

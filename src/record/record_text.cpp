@@ -1,6 +1,8 @@
 #include "record/record_text.h"
 
 #include "component/money.h"
+#include "component/stored_value.h"
+#include "platform/errors.h"
 
 #include <algorithm>
 #include <cmath>
@@ -48,6 +50,24 @@ QString participationText(double quota, double remunerations, const QLocale& loc
     if (remunerations == 0.0)
         return QStringLiteral("0");
     return plainNumber(roundHalfEven(quota / remunerations, 5), locale);
+}
+
+double amountOf(const QVariant& value, const QString& column)
+{
+    const StoredNumber amount = readStoredAmount(value);
+    if (amount.isBad())
+        throw QuotasError(QStringLiteral("O campo \"%1\" desta quota tem um %2: não é possível fazer contas com ele. "
+                                         "Corrija-o primeiro.")
+                              .arg(column, amount.problem()));
+    return amount.isNull() ? 0.0 : amount.value;
+}
+
+QString amountText(const QVariant& value, const QLocale& locale)
+{
+    const StoredNumber amount = readStoredAmount(value);
+    if (amount.isNull())
+        return QString();
+    return amount.isNumber() ? formatMoney(amount.value, locale) : value.toString();
 }
 
 }  // namespace quotas

@@ -20,10 +20,13 @@ QString plainNumber(double value, const QLocale& locale = QLocale());
 // decimal places half to even; "0" when the remunerations add up to 0.
 QString participationText(double quota, double remunerations, const QLocale& locale = QLocale());
 
-// A column value as the window computes with it: Null counts as 0.
-inline double amountOf(const QVariant& value)
-{
-    return value.isNull() ? 0.0 : value.toDouble();
-}
+// A column value as the window computes with it: Null counts as 0. A value
+// that is not a finite number within range stops the computation with
+// QuotasError naming the column: it is never taken as 0.
+double amountOf(const QVariant& value, const QString& column);
+
+// An amount as the window shows it: empty for Null, the money format for a
+// number, and a value that is not one as it is stored.
+QString amountText(const QVariant& value, const QLocale& locale = QLocale());
 
 }  // namespace quotas

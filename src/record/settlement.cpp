@@ -7,6 +7,7 @@
 
 #include "component/money.h"
 #include "component/month_names.h"
+#include "component/stored_value.h"
 #include "platform/errors.h"
 #include "platform/message_boxes.h"
 #include "platform/recordset.h"
@@ -37,8 +38,8 @@ void FrmQuota::Command2_Click()
 {
     if (!validateActiveField())
         return;
-    const double quota = amountOf(Adodc1->value(QStringLiteral("quota")));
-    const double pago = amountOf(Adodc1->value(QStringLiteral("pago")));
+    const double quota = amountOf(Adodc1->value(QStringLiteral("quota")), QStringLiteral("quota"));
+    const double pago = amountOf(Adodc1->value(QStringLiteral("pago")), QStringLiteral("pago"));
     if (inCents(pago) == inCents(quota))
         return;
 
@@ -49,6 +50,10 @@ void FrmQuota::Command2_Click()
     const std::optional<double> typed = parseDecimal(*answer);
     if (!typed)
         return;
+    if (!amountInRange(*typed) || !amountInRange(pago + *typed)) {
+        refuse(invalidValue());
+        return;
+    }
     // Refused before the save step: an amount that comes to nothing in
     // cents must not leave the corrections saved with no payment and no word.
     const double amount = roundCents(*typed);

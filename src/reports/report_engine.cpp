@@ -1,5 +1,7 @@
 #include "reports/report_engine.h"
 
+#include "component/stored_value.h"
+
 #include "component/money.h"
 #include "platform/errors.h"
 #include "platform/recordset.h"
@@ -142,7 +144,10 @@ ReportDocument layOutReport(std::shared_ptr<const ReportLayout> layoutPtr, Recor
                 if (v.isNull())
                     continue;
                 ++it->count;
-                it->cents += std::llround(roundCents(v.toDouble()) * 100.0);
+                // A value that is not an amount (printed as such) adds nothing.
+                const StoredNumber amount = readStoredAmount(v);
+                if (amount.isNumber())
+                    it->cents += std::llround(roundCents(amount.value) * 100.0);
             }
         }
     }

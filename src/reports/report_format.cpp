@@ -1,5 +1,7 @@
 #include "reports/report_format.h"
 
+#include "component/stored_value.h"
+
 #include "component/money.h"
 
 #include <QLocale>
@@ -140,6 +142,9 @@ QString formatReportValue(const QVariant& value, const QString& format)
         number = value.toString().trimmed().toDouble(&ok);
         isNumber = ok;
     }
+    // An amount no column should hold is shown as such, never as digits.
+    if (isNumber && !amountInRange(number))
+        return QStringLiteral("valor inválido");
     if (isNumber && !format.isEmpty())
         return formatNumber(number, format);
     if (type == QMetaType::Double || type == QMetaType::Float)

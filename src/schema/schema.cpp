@@ -5,6 +5,9 @@
 #include "platform/errors.h"
 #include "platform/transaction.h"
 
+#include <QSqlQuery>
+#include <QSqlRecord>
+
 namespace quotas {
 
 namespace {
@@ -30,7 +33,7 @@ struct ColumnDef {
 struct TableDef {
     QString name;
     std::vector<ColumnDef> columns;
-    QStringList indexes;  // "[UNIQUE ]name ON (columns)"
+    QStringList indexes;  // "name ON (columns)", made with a table of the host's that is created here
     QStringList seed;     // rows inserted when the table is created
 };
 
@@ -95,22 +98,13 @@ std::vector<TableDef> tables()
         {QStringLiteral("tbfuvs"), {{"code", Kind::TextKey, 10}, {"descrit", Kind::Text, 60}, {"rend1", Kind::Money}}, {}, {}},
         {QStringLiteral("tbEmpresas"),
          {{"code", Kind::TextKey, 10}, {"nome", Kind::Text, 100}, {"percent_sindicato", Kind::Rate}}, {}, {}},
-        {QStringLiteral("tbcontadores"), {{"contador_id", Kind::Key}, {"quotas", Kind::Int}}, {}, {}},
-        {QStringLiteral("tbQuotas_Socios"), accountColumns(),
-         {QStringLiteral("UNIQUE ux_tbquotas_socios_socio ON (socio_id)")}, {}},
-        {QStringLiteral("tbQuotas_Socios_Inactivos"), accountColumns(),
-         {QStringLiteral("UNIQUE ux_tbquotas_socios_inactivos_socio ON (socio_id)")}, {}},
-        // One due of each type per member and month: two generation runs at
-        // once can never charge a member twice.
-        {QStringLiteral("tbQuotas_Movimentos"), movementColumns(),
-         // It also finds a member's movements; the import reads a whole month
-         // once per run, which needs no index of its own.
-         {QStringLiteral("UNIQUE ux_tbquotas_movimentos_due ON (socio_id, ano, mes, tipo)")},
-         {}},
-        {QStringLiteral("tbQuotas_Movimentos_Inactivos"), movementColumns(),
-         {QStringLiteral("ix_tbquotas_movimentos_inactivos_socio ON (socio_id)")}, {}},
-        {QStringLiteral("tbQuotas_Movimentos_Historico"), movementColumns(),
-         {QStringLiteral("ix_tbquotas_movimentos_historico_socio ON (socio_id)")}, {}},
+        // The counter is one column, as the host's installations have it.
+        {QStringLiteral("tbcontadores"), {{"quotas", Kind::Int}}, {}, {}},
+        {QStringLiteral("tbQuotas_Socios"), accountColumns(), {}, {}},
+        {QStringLiteral("tbQuotas_Socios_Inactivos"), accountColumns(), {}, {}},
+        {QStringLiteral("tbQuotas_Movimentos"), movementColumns(), {}, {}},
+        {QStringLiteral("tbQuotas_Movimentos_Inactivos"), movementColumns(), {}, {}},
+        {QStringLiteral("tbQuotas_Movimentos_Historico"), movementColumns(), {}, {}},
         {QStringLiteral("extras"), extras, {}, {}},
         {QStringLiteral("tbmeses"), {{"code", Kind::TextKey, 2}, {"descrit", Kind::Text, 20}}, {}, months},
         {QStringLiteral("tbsexos"), {{"code", Kind::TextKey, 1}, {"descrit", Kind::Text, 20}}, {},
@@ -119,7 +113,104 @@ std::vector<TableDef> tables()
 }
 // clang-format on
 
+struct IndexDef {
+    const char* table;
+    const char* name;
+    const char* columns;
+    // A unique index that duplicates may prevent: a plain index on the same
+    // columns keeps the runs fast in its place, and the rows that share the
+    // columns are listed.
+    const char* fallback = nullptr;
+    const char* duplicates = nullptr;
+    const char* what = nullptr;
+};
+
+// The rows are listed with the member's staff number; the last column is the
+// key of each row.
+const IndexDef kIndexes[] = {
+    {"tbQuotas_Socios", "ux_tbquotas_socios_socio", "socio_id", "ix_tbquotas_socios_socio",
+     "SELECT a.socio_id, s.no_tap, a.squota_id FROM tbQuotas_Socios a JOIN (SELECT socio_id FROM tbQuotas_Socios "
+     "GROUP BY socio_id HAVING COUNT(*) > 1) d ON d.socio_id = a.socio_id LEFT OUTER JOIN tbSocios s ON s.socio_id = "
+     "a.socio_id ORDER BY a.socio_id, a.squota_id",
+     "uma conta por associado"},
+    {"tbQuotas_Socios_Inactivos", "ux_tbquotas_socios_inactivos_socio", "socio_id", "ix_tbquotas_socios_inactivos_socio",
+     "SELECT a.socio_id, s.no_tap, a.squota_id FROM tbQuotas_Socios_Inactivos a JOIN (SELECT socio_id FROM "
+     "tbQuotas_Socios_Inactivos GROUP BY socio_id HAVING COUNT(*) > 1) d ON d.socio_id = a.socio_id LEFT OUTER JOIN "
+     "tbSocios s ON s.socio_id = a.socio_id ORDER BY a.socio_id, a.squota_id",
+     "uma conta inactiva por associado"},
+    {"tbQuotas_Movimentos", "ux_tbquotas_movimentos_due", "socio_id, ano, mes, tipo", "ix_tbquotas_movimentos_due",
+     "SELECT m.socio_id, s.no_tap, m.ano, m.mes, m.tipo, m.quota_id FROM tbQuotas_Movimentos m JOIN (SELECT socio_id, "
+     "ano, mes, tipo FROM tbQuotas_Movimentos GROUP BY socio_id, ano, mes, tipo HAVING COUNT(*) > 1) d ON d.socio_id = "
+     "m.socio_id AND d.ano = m.ano AND d.mes = m.mes AND d.tipo = m.tipo LEFT OUTER JOIN tbSocios s ON s.socio_id = "
+     "m.socio_id ORDER BY m.socio_id, m.ano, m.mes, m.tipo, m.quota_id",
+     "uma quota de cada tipo por associado e mês"},
+    {"tbQuotas_Movimentos_Inactivos", "ix_tbquotas_movimentos_inactivos_socio", "socio_id"},
+    {"tbQuotas_Movimentos_Historico", "ix_tbquotas_movimentos_historico_socio", "socio_id"},
+};
+
+void createIndex(Connection& connection, bool unique, const char* name, const IndexDef& index)
+{
+    connection.execute(QStringLiteral("CREATE %1INDEX IF NOT EXISTS %2 ON %3 (%4)")
+                           .arg(unique ? QStringLiteral("UNIQUE ") : QString(), QString::fromLatin1(name),
+                                QString::fromLatin1(index.table), QString::fromLatin1(index.columns)));
+}
+
+// One line per group of rows that share what the index would keep unique.
+QStringList duplicateLines(Connection& connection, const IndexDef& index)
+{
+    QStringList lines;
+    QSqlQuery& q = connection.run(QString::fromLatin1(index.duplicates), {});
+    const int last = q.record().count() - 1;
+    QString group;
+    QStringList keys;
+    auto flush = [&] {
+        if (!keys.isEmpty())
+            lines << QStringLiteral("  %1: registos %2").arg(group, keys.join(QStringLiteral(", ")));
+        keys.clear();
+    };
+    while (q.next()) {
+        const QString noTap = q.value(1).isNull() ? QStringLiteral("sem número") : q.value(1).toString();
+        QString label = QStringLiteral("associado %1 (Nº Empresa %2)").arg(q.value(0).toString(), noTap);
+        if (last == 5)
+            label += QStringLiteral(", %1/%2, tipo %3")
+                         .arg(q.value(2).toString(), q.value(3).toString().rightJustified(2, u'0'), q.value(4).toString());
+        if (label != group)
+            flush();
+        group = label;
+        keys << q.value(last).toString();
+    }
+    q.finish();
+    flush();
+    return lines;
+}
+
 }  // namespace
+
+IndexReport addIndexes(Connection& connection)
+{
+    IndexReport report;
+    for (const IndexDef& index : kIndexes) {
+        if (!connection.hasTable(QString::fromLatin1(index.table)))
+            continue;
+        // Nothing here changes a row: a unique index that the rows do not
+        // allow is not made, and the rows are only listed.
+        if (index.duplicates) {
+            const QStringList lines = duplicateLines(connection, index);
+            if (!lines.isEmpty()) {
+                report.blocked << QStringLiteral("O índice único %1 (%2) não foi criado: em %3 há registos repetidos.")
+                                      .arg(QString::fromLatin1(index.name), QString::fromLatin1(index.what),
+                                           QString::fromLatin1(index.table))
+                               << lines;
+                createIndex(connection, false, index.fallback, index);
+                report.added << QString::fromLatin1(index.fallback);
+                continue;
+            }
+        }
+        createIndex(connection, index.duplicates != nullptr, index.name, index);
+        report.added << QString::fromLatin1(index.name);
+    }
+    return report;
+}
 
 QStringList schemaTables()
 {
@@ -180,12 +271,9 @@ QStringList createSchema(Connection& connection)
         Transaction tx(connection);
         connection.execute(QStringLiteral("CREATE TABLE %1 (%2)").arg(table.name, columns.join(QStringLiteral(", "))));
         for (const QString& index : table.indexes) {
-            const bool unique = index.startsWith(QStringLiteral("UNIQUE "));
-            const QString body = unique ? index.mid(7) : index;
-            const qsizetype on = body.indexOf(QStringLiteral(" ON "));
-            connection.execute(QStringLiteral("CREATE %1INDEX %2 ON %3 %4")
-                                   .arg(unique ? QStringLiteral("UNIQUE ") : QString(), body.left(on), table.name,
-                                        body.mid(on + 4)));
+            const qsizetype on = index.indexOf(QStringLiteral(" ON "));
+            connection.execute(
+                QStringLiteral("CREATE INDEX %1 ON %2 %3").arg(index.left(on), table.name, index.mid(on + 4)));
         }
         for (const QString& row : table.seed)
             connection.execute(QStringLiteral("INSERT INTO %1 VALUES (%2)").arg(table.name, row));

@@ -1,6 +1,9 @@
-// Rounding, reading typed amounts, and the dialogs' money format.
+// Rounding, reading typed and stored amounts, and the dialogs' money format.
 
 #include "component/money.h"
+#include "component/stored_value.h"
+
+#include <limits>
 
 #include <QTest>
 
@@ -68,6 +71,61 @@ private slots:
                 QCOMPARE(*parsed, value);
         }
         QLocale::setDefault(QLocale::c());
+    }
+
+    // What a column gave back, as every run reads it: "n" and the number,
+    // "-" for Null, else the problem the runs report.
+    void readsStoredValues_data()
+    {
+        QTest::addColumn<QVariant>("stored");
+        QTest::addColumn<QString>("read");
+        const double inf = std::numeric_limits<double>::infinity();
+        QTest::newRow("Null") << QVariant(QMetaType::fromType<double>()) << "-";
+        QTest::newRow("number") << QVariant(12.5) << "n 12.5";
+        QTest::newRow("integer") << QVariant(7) << "n 7";
+        QTest::newRow("text with a comma") << QVariant("1000,50") << "n 1000.5";
+        QTest::newRow("text with a point, spaces") << QVariant(" -1000.50 ") << "n -1000.5";
+        QTest::newRow("grouped text is not read") << QVariant("1.000,50") << "valor ilegível (1.000,50)";
+        QTest::newRow("exponent is not read") << QVariant("1e3") << "valor ilegível (1e3)";
+        QTest::newRow("letters") << QVariant("abc") << "valor ilegível (abc)";
+        QTest::newRow("empty text") << QVariant("") << "valor ilegível ()";
+        QTest::newRow("infinity") << QVariant(inf) << "valor não finito (inf)";
+        QTest::newRow("NaN as text") << QVariant("NaN") << "valor não finito (NaN)";
+        QTest::newRow("largest amount") << QVariant(9999999999.99) << "n 9999999999.99";
+        QTest::newRow("beyond it") << QVariant(-10000000000.0) << "valor fora dos limites de ±9.999.999.999,99 (-10000000000.00)";
+        QTest::newRow("2e23 as text") << QVariant("200000000000000000000000") << "valor fora dos limites de "
+                                                                                 "±9.999.999.999,99 (200000000000000000000000)";
+    }
+    void readsStoredValues()
+    {
+        QFETCH(QVariant, stored);
+        QFETCH(QString, read);
+        const StoredNumber n = readStoredAmount(stored);
+        QCOMPARE(n.isNull() ? "-" : n.isNumber() ? "n " + QString::number(n.value, 'g', 15)
+                                                 : n.problem(),
+                 read);
+    }
+
+    void readsStoredDates_data()
+    {
+        QTest::addColumn<QVariant>("stored");
+        QTest::addColumn<QString>("read");
+        QTest::newRow("Null") << QVariant(QMetaType::fromType<QDate>()) << "-";
+        QTest::newRow("date") << QVariant(QDate(2001, 3, 31)) << "2001-03-31";
+        QTest::newRow("ISO text") << QVariant("2001-03-31") << "2001-03-31";
+        QTest::newRow("ISO with a time") << QVariant("2001-03-31 00:00:00") << "2001-03-31";
+        QTest::newRow("day first") << QVariant("31/03/2001") << "2001-03-31";
+        QTest::newRow("number") << QVariant(20010331) << "data ilegível (20010331)";
+        QTest::newRow("no such day") << QVariant("31/02/2001") << "data ilegível (31/02/2001)";
+    }
+    void readsStoredDates()
+    {
+        QFETCH(QVariant, stored);
+        QFETCH(QString, read);
+        const StoredDate d = readStoredDate(stored);
+        QCOMPARE(d.isNull() ? "-" : d.ok ? d.date.toString(Qt::ISODate)
+                                         : d.problem(),
+                 read);
     }
 
     void formatsMoney_data()

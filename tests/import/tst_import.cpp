@@ -266,7 +266,10 @@ private slots:
         QTest::newRow("whole cents 1250") << Posting{10.0, 0.0, "1250", true, "12.5|42.5|42.5"};
         QTest::newRow("comma 12,50") << Posting{10.0, 0.0, "\"12,50\"", false, "12.5|42.5|42.5"};
         QTest::newRow("beyond single precision") << Posting{10.0, 0.0, "123456.78", false, "123456.78|123486.78|123486.78"};
-        QTest::newRow("Null charge and payment") << Posting{kNull, kNull, "8", false, "8|48|38"};
+        // Compared with Null, neither "equals 0" nor "greater than" holds.
+        QTest::newRow("Null payment: left alone") << Posting{10.0, kNull, "8", false, ""};
+        QTest::newRow("Null charge, nothing paid") << Posting{kNull, 0.0, "8", false, "8|48|38"};
+        QTest::newRow("Null charge, paid") << Posting{kNull, 5.0, "8", false, ""};
     }
     void postsByTheRules()
     {

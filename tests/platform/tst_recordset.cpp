@@ -36,7 +36,8 @@ private slots:
         c().execute(QStringLiteral("INSERT INTO tbSocios (socio_id, no_tap, nome) VALUES (1, '', 'Ana'), (2, NULL, 'Rui')"));
         addMovement(1, 2003, 1, 1, 0.0, QVariant(QMetaType::fromType<double>()));
         Recordset rs;
-        rs.open(QStringLiteral("SELECT tbSocios.no_tap, tbQuotas_Movimentos.* FROM tbQuotas_Movimentos "
+        // Two columns of one name: the first one is the field.
+        rs.open(QStringLiteral("SELECT tbSocios.no_tap, tbQuotas_Movimentos.*, tbSocios.nome AS pago FROM tbQuotas_Movimentos "
                                "LEFT OUTER JOIN tbSocios ON tbQuotas_Movimentos.socio_id = tbSocios.socio_id"),
                 c(), Cursor::Keyset, Lock::Optimistic);
         QCOMPARE(rs.recordCount(), 1);

@@ -102,8 +102,10 @@ TestDatabase::TestDatabase(Engine engine, bool withSchema)
     m_connection = std::make_unique<Connection>(QStringLiteral("test"));
     m_connection->setConnectionString(m_connectionString);
     m_connection->open(Connection::OpenMode::CreateIfMissing);
-    if (withSchema)
+    if (withSchema) {
         createSchema(*m_connection);
+        addIndexes(*m_connection);
+    }
 }
 
 TestDatabase::~TestDatabase()

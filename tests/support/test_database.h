@@ -15,7 +15,9 @@ QString engineName();
 // A fresh database of the engine under test, dropped when it goes. On
 // PostgreSQL it is a new database on the test server named by
 // QUOTAS_TEST_PG_HOST, _PORT, _USER and _PASSWORD; when those are missing the
-// constructor throws, so the test fails instead of skipping.
+// constructor throws, so the test fails instead of skipping. withSchema
+// gives the tables with every index init-db adds; without it the database is
+// empty (createSchema alone gives the host's original shape).
 class TestDatabase {
 public:
     explicit TestDatabase(bool withSchema = true);

@@ -101,10 +101,12 @@ public:
 private:
     bool fullyCharged(const Recordset& member) const
     {
+        // A value that cannot be read is left to the posting, which reports it.
+        const StoredNumber seguro = readStoredNumber(member.value(QStringLiteral("seguro")));
+        const StoredDate end = readStoredDate(member.value(QStringLiteral("seguro_data_rescisao")));
         return !member.isNull(QStringLiteral("squota_id")) && member.value(QStringLiteral("sindicato")).toInt() > 0
                && (member.value(QStringLiteral("seguro_lancado")).toInt() > 0
-                   || !insuranceCharged(member.value(QStringLiteral("seguro")),
-                                        member.value(QStringLiteral("seguro_data_rescisao")), m_ano, m_mes));
+                   || (!seguro.isBad() && end.ok && !insuranceCharged(seguro, end, m_ano, m_mes)));
     }
 
     void createAccount(const Recordset& member)

@@ -90,7 +90,7 @@ void repairNulls(Connection& connection, MaintenancePanel& panel, int pass, cons
             if (amount.isBad())
                 throw QuotasError(QStringLiteral("na tabela %1, o movimento com %2 %3 tem na coluna %4 um %5. "
                                                  "Corrija esse valor.")
-                                      .arg(table, key, work.value(0).toString(), work.fieldName(column).toLower(),
+                                      .arg(table, key, work.value(0).toString(), work.row().fieldName(column).toLower(),
                                            amount.problem()));
             hasNull = hasNull || amount.isNull();
         }

@@ -72,10 +72,10 @@ int duesNotComputed(Connection& connection, int year, int month, const std::arra
             const int t = int(type) - 1;
             if (charged[size_t(t)].contains(socio))
                 continue;
-            if (type == DueType::Seguro && !insuranceCharged(members.value(2), members.value(3), year, month))
+            if (type == DueType::Seguro && !insuranceCharged(readStoredNumber(members.value(2)), readStoredDate(members.value(3)), year, month))
                 continue;
             const QVariant personal = members.value(type == DueType::Sindicato ? 7 : 8);
-            if (!remunerations || !dueRate(personal, employerFound, employerRates.value(employer)))
+            if (!remunerations || !dueRate(readStoredNumber(personal), employerFound, readStoredNumber(employerRates.value(employer))))
                 ++count;
         }
     }

@@ -100,10 +100,12 @@ void FrmQuota::Command1_Click()
     // The second line names the movement, so that no one deletes another by
     // mistake; Enter answers No.
     const int mes = Adodc1->value(QStringLiteral("mes")).toInt();
+    // A movement whose amount cannot be read can still be deleted.
+    const StoredNumber due = readStoredAmount(Adodc1->value(QStringLiteral("quota")));
     const QString movement = QStringLiteral("%1, %2 de %3, %4")
                                  .arg(Adodc1->value(QStringLiteral("ref")).toString(), monthNames().value(mes - 1, QString::number(mes)),
                                       Adodc1->value(QStringLiteral("ano")).toString(),
-                                      formatMoney(amountOf(Adodc1->value(QStringLiteral("quota")))));
+                                      due.isBad() ? due.raw.toString() : formatMoney(due.value));
     if (msgBox(QStringLiteral("Quer eliminar este registo?\n") + movement, Buttons::YesNoDefaultNo, Icon::Question,
                QStringLiteral("Quotizações"))
         != Answer::Yes)

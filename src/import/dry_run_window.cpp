@@ -91,15 +91,7 @@ ReportDocument layOutDryRun(const ImportVerdicts& verdicts, const QString& subje
     r.reportFooter = reportBand(QStringLiteral("Totais"), 420,
                                 {hline(QStringLiteral("linTotais"), 75, 15, 10500),
                                  label(QStringLiteral("lblTotais"), dryRunTotals(verdicts), 60, 120, 10400, 240, bold)});
-    r.pageFooter = reportBand(
-        QStringLiteral("RodapePagina"), 390,
-        {hline(QStringLiteral("linRodape"), 75, 60, 10500),
-         label(QStringLiteral("lblProcessado"), QStringLiteral("Processado por Computador"), 60, 105, 2130, 225, arial(6.75)),
-         label(QStringLiteral("lblPagina"), QStringLiteral("Página:"), 8490, 105, 570, 255, arial(8.25, false, true)),
-         label(QStringLiteral("lblPaginaNo"), QStringLiteral("%p"), 9090, 105, 585, 240, arial(8.25, false, true),
-               Align::Right),
-         label(QStringLiteral("lblBarra"), QStringLiteral("/"), 9720, 105, 135, 240),
-         label(QStringLiteral("lblPaginas"), QStringLiteral("%P"), 9900, 105, 675, 240, arial(8.25, false, true))});
+    r.pageFooter = numberedPageFooter(QStringLiteral("RodapePagina"));
 
     Recordset rows;
     rows.openInMemory(fields);

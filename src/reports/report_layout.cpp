@@ -97,4 +97,17 @@ ReportFont timesNewRoman(double pointSize, bool bold, bool italic)
     return {QStringLiteral("Times New Roman"), pointSize, bold, italic};
 }
 
+ReportBand numberedPageFooter(const QString& name)
+{
+    return reportBand(
+        name, 390,
+        {hline(QStringLiteral("linRodape"), 75, 60, 10500),
+         label(QStringLiteral("lblProcessado"), QStringLiteral("Processado por Computador"), 60, 105, 2130, 225, arial(6.75)),
+         label(QStringLiteral("lblPagina"), QStringLiteral("Página:"), 8490, 105, 570, 255, arial(8.25, false, true)),
+         label(QStringLiteral("lblPaginaNo"), QStringLiteral("%p"), 9090, 105, 585, 240, arial(8.25, false, true),
+               Align::Right),
+         label(QStringLiteral("lblBarra"), QStringLiteral("/"), 9720, 105, 135, 240),
+         label(QStringLiteral("lblPaginas"), QStringLiteral("%P"), 9900, 105, 675, 240, arial(8.25, false, true))});
+}
+
 }  // namespace quotas

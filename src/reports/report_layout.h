@@ -109,6 +109,10 @@ ReportItem countOf(const QString& name, const QString& column, int left, int top
 ReportItem sumOf(const QString& name, const QString& column, const QString& format, int left, int top, int width,
                  int height, ReportFont font = {}, Align align = Align::Left);
 
+// The page footer of the listings: a rule, "Processado por Computador" and
+// "Página: n / total".
+ReportBand numberedPageFooter(const QString& name);
+
 // Fonts by the names the layouts use; the drawing resolves Arial and Times
 // New Roman to the metric-compatible Liberation fonts.
 ReportFont arial(double pointSize = 8.25, bool bold = false, bool italic = false);

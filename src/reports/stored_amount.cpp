@@ -1,33 +1,27 @@
 #include "reports/stored_amount.h"
 
 #include "component/money.h"
+#include "component/stored_value.h"
 
 #include <cmath>
 
 namespace quotas {
 
-namespace {
-
-// NUMERIC(12,2): ten whole digits.
-constexpr double kLargestAmount = 9999999999.99;
-
-}  // namespace
-
+// The reports read amounts by the runs' rules, so a value the runs compute
+// with is the value a report sums, and one they refuse is counted apart.
 StoredAmount readReportAmount(const QVariant& value)
 {
+    const StoredNumber stored = readStoredAmount(value);
     StoredAmount a;
-    if (!value.isValid() || value.isNull())
+    if (stored.isNull())
         return a;
-    bool ok = false;
-    const double number = value.metaType().id() == QMetaType::QString ? value.toString().trimmed().toDouble(&ok)
-                                                                      : value.toDouble(&ok);
-    if (!ok || !std::isfinite(number) || std::fabs(number) > kLargestAmount) {
+    if (!stored.isNumber()) {
         a.state = StoredAmount::State::Unreadable;
         a.text = value.toString();
         return a;
     }
     a.state = StoredAmount::State::Readable;
-    a.cents = std::llround(roundCents(number) * 100.0);
+    a.cents = std::llround(roundCents(stored.value) * 100.0);
     return a;
 }
 

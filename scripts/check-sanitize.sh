@@ -17,7 +17,7 @@ cmake --build $build -j2
 # No suppressions: Qt, its SQLite driver and libcsv report nothing here.
 export ASAN_OPTIONS=detect_leaks=1:strict_string_checks=1:detect_stack_use_after_return=1:check_initialization_order=1
 export UBSAN_OPTIONS=print_stacktrace=1:halt_on_error=1
-ctest --test-dir $build --output-on-failure -j2 -L 'unit|sqlite' "$@"
+ctest --test-dir $build --output-on-failure -j2 -L 'unit|sqlite' -LE server "$@"
 
 ((fuzz_seconds > 0)) || exit 0
 # Each target runs alone in one process; two at a time, one per core.

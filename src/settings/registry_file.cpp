@@ -9,6 +9,7 @@
 #include <QSaveFile>
 #include <QStringDecoder>
 #include <QStringEncoder>
+#include <algorithm>
 #include <sys/stat.h>
 
 namespace quotas {
@@ -106,8 +107,16 @@ QByteArray encodeFile(const QString& text, RegistryFile::Encoding encoding)
     }
     case Encoding::Utf8Bom:
         return QByteArray("\xEF\xBB\xBF") + text.toUtf8();
-    case Encoding::CodePage1252:
-        return toCodePage1252(text);
+    case Encoding::CodePage1252: {
+        // Once a line with the byte that made the file ANSI is gone, what is
+        // left may also be valid UTF-8 and would be read back as such, every
+        // accented letter changed; with the UTF-8 mark it reads back as it was.
+        const QByteArray ansi = toCodePage1252(text);
+        const bool ascii = std::all_of(ansi.begin(), ansi.end(), [](char c) { return uchar(c) < 0x80; });
+        if (ascii || !QByteArrayView(ansi).isValidUtf8())
+            return ansi;
+        return QByteArray("\xEF\xBB\xBF") + text.toUtf8();
+    }
     case Encoding::Utf8:
         break;
     }

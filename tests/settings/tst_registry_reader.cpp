@@ -225,6 +225,15 @@ private slots:
             QCOMPARE(reread.data(QLatin1String(key), QLatin1String(value)), before.data(QLatin1String(key), QLatin1String(value)));
     }
 
+    // Regression: an ANSI file whose only byte invalid in UTF-8 was in a comment
+    // was written back as bytes that read as UTF-8, "Ã©" turned into "é".
+    void anAnsiFileReadsBackAsItWas()
+    {
+        RegistryFile file = RegistryFile::parse("REGEDIT4\n[" + kKey.toLatin1() + "]\n\"s\"=\"\xC3\xA9\"\n; \xFF\n");
+        file.setString(kKey, QStringLiteral("dtUser"), QStringLiteral("u"));
+        QCOMPARE(RegistryFile::parse(file.serialize()).data(kKey, QStringLiteral("s")), std::optional<QByteArray>(QByteArray("\xC3\xA9", 3)));
+    }
+
     // Regression: 20,000 values took 8.9 s to read (each compared with all before it).
     void readingIsLinear()
     {

@@ -5,10 +5,12 @@
 #include "generation/processar_quotas.h"
 #include "platform/message_boxes.h"
 
+#include <cstdio>
+
 namespace quotas::cli {
 
 // The dialog's run without the dialog: no confirmation, the same closing
-// message, and the dues that could not be generated after it.
+// message and counts, and the dues that could not be generated after them.
 int gerar(const QStringList& args)
 {
     const Options options(QStringLiteral("gerar"), args);
@@ -27,6 +29,8 @@ int gerar(const QStringList& args)
     const GenerationOutcome outcome = ProcessarQuotas(ano, mes, socio);
     msgBox(QStringLiteral("Fim do processamento de quotizações"), Buttons::Ok, Icon::Information,
            QStringLiteral("Gerar Quotas"));
+    // The counts a script reads, a line each, as the dialog shows them.
+    std::fputs((outcome.counts() + u'\n').toUtf8().constData(), stdout);
     if (outcome.notGenerated() == 0)
         return 0;
     msgBox(outcome.summary(), Buttons::Ok, Icon::Exclamation, QStringLiteral("Gerar Quotas"));

@@ -81,6 +81,7 @@ int importar(const QStringList& args)
         throw QuotasError(QStringLiteral("a importação foi feita, mas a listagem dos registos não importados não foi "
                                          "escrita em %1: %2")
                               .arg(pdf, listingFailure));
+    std::fputs((summary.counts() + u'\n').toUtf8().constData(), stdout);
     if (listingWritten)
         std::fputs(QStringLiteral("Listagem dos registos não importados escrita em %1.\n").arg(pdf).toUtf8().constData(),
                    stdout);

@@ -278,11 +278,12 @@ private slots:
         QCOMPARE(gerar({"--ano", "2003", "--mes", "13"}).status, 2);
         QCOMPARE(dues(2003, 1), QStringList());
         const CliRun one = gerar({"--ano", "2003", "--mes", "1", "--no-tap", "1002"});
-        QCOMPARE(one.out + QString::number(one.status), "Fim do processamento de quotizações\n0");
+        QCOMPARE(one.out + QString::number(one.status),
+                 "Fim do processamento de quotizações\nAssociados processados: 1\nQuotas lançadas: 1\nQuotas não lançadas: 0\n0");
         QCOMPARE(dues(2003, 1), QStringList{"2|1|37.5"});
         const CliRun leftOut = gerar({"--ano", "2003", "--mes", "1"});
         QCOMPARE(leftOut.out,
-                 "Fim do processamento de quotizações\nNão foi gerada 1 quota: - 1 quota porque a conta do associado não tem a "
+                 "Fim do processamento de quotizações\nAssociados processados: 3\nQuotas lançadas: 1\nQuotas não lançadas: 1\nNão foi gerada 1 quota: - 1 quota porque a conta do associado não tem a "
                  "remuneração 1 ou a remuneração 2 (Nº Empresa: 1003); Corrija estes valores e volte a gerar o mesmo mês: as "
                  "quotas já geradas não se repetem.\n");
         QCOMPARE(leftOut.status, 3);

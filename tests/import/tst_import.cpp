@@ -471,7 +471,8 @@ private slots:
         const QStringList march = {"--ano", "2004", "--mes", "3", "--tipo", "1", "--sem-separador", "--pdf", pdf};
         const CliRun done = importar(march);
         QVERIFY2(done.status == 3 && QFile::exists(pdf) && done.out.contains(pdf)
-                     && done.out.startsWith("Durante o processo de importação de dados não foram registados 1 associados.\n"),
+                     && done.out.startsWith("Durante o processo de importação de dados não foram registados 1 associados.\nLinhas lançadas: 1\n"
+                                            "Linhas deixadas como estavam (já lançadas): 0\nLinhas rejeitadas: 1\n"),
                  qPrintable(done.out + done.err));
         QCOMPARE(rows("SELECT pago FROM tbQuotas_Movimentos"), QStringList{"8"});
         const CliRun none = importar(march, useFile("no_tap;quota\n100;800\n"));

@@ -7,15 +7,11 @@
 #include "generation/frm_anular_geracao.h"
 #include "generation/processar_quotas.h"
 #include "schema/demo_data.h"
-#include "schema/schema.h"
-#include "support/cli_process.h"
+#include "support/database_fixture.h"
 #include "support/recording_progress.h"
-#include "support/rows_text.h"
 #include "support/scripted_boxes.h"
-#include "support/test_database.h"
 
 #include <QComboBox>
-#include <QFile>
 #include <QPlainTextEdit>
 #include <QProcess>
 #include <QSpinBox>
@@ -36,24 +32,10 @@ QStringList keys(const QList<UndoDue>& dues)
 
 }  // namespace
 
-class UndoTest : public QObject {
+class UndoTest : public QObject, DatabaseFixture {
     Q_OBJECT
 
-    std::unique_ptr<TestDatabase> db;
-    QString registry;
-
-    Connection& c() { return db->connection(); }
-    QStringList rows(const QString& sql, const QVariantList& params = {}) { return rowsText(c(), sql, params); }
-    CliRun quotas(const QStringList& args) { return runQuotas(registry, args); }
     void generate(int mes) { ProcessarQuotas(c(), 2004, mes, 0, QDate(2004, mes, 1)); }
-    // Every table, whole, for "nothing changed".
-    QStringList everything()
-    {
-        QStringList out;
-        for (const QString& table : schemaTables())
-            out << table << rows(QStringLiteral("SELECT * FROM %1 ORDER BY 1").arg(table));
-        return out;
-    }
 
     // Members 1 to 6, insured, charged February and March 2004 (37.50 of
     // each type), then March touched: 2's union due paid by hand, 3's taken
@@ -72,19 +54,14 @@ class UndoTest : public QObject {
         c().execute("UPDATE tbQuotas_Movimentos SET doc_no = 'R2'" + march, {4, 2});
         c().execute("UPDATE tbQuotas_Movimentos SET pago = NULL" + march, {5, 1});
         c().execute("UPDATE tbQuotas_Movimentos SET pago = quota, rend2 = 0, doc_no = 'R3'" + march, {6, 1});
-        QFile list(db->scratch("marco.csv"));
-        QVERIFY(list.open(QIODevice::WriteOnly) && list.write("no_tap;quota\n1003;30.00\n") > 0);
-        list.close();
-        const CliRun imported = quotas({"importar", "--ano", "2004", "--mes", "3", "--tipo", "1", list.fileName()});
+        const CliRun imported = quotas({"importar", "--ano", "2004", "--mes", "3", "--tipo", "1", writeFile("marco.csv", "no_tap;quota\n1003;30.00\n")});
         QVERIFY2(imported.status == 0, qPrintable(imported.err));
     }
 
 private slots:
     void initTestCase()
     {
-        db = std::make_unique<TestDatabase>();
-        db->login();
-        registry = db->useAsSettings();
+        openDatabase();
         RecordingProgress::install();
     }
     void init()

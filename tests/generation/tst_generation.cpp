@@ -8,11 +8,9 @@
 #include "generation/processar_quotas.h"
 #include "schema/demo_data.h"
 #include "schema/schema.h"
-#include "support/cli_process.h"
+#include "support/database_fixture.h"
 #include "support/recording_progress.h"
-#include "support/rows_text.h"
 #include "support/scripted_boxes.h"
-#include "support/test_database.h"
 
 #include <QApplication>
 #include <QLineEdit>
@@ -28,7 +26,6 @@ using namespace quotas::test;
 
 namespace {
 
-const QVariant kNull = QVariant(QMetaType::fromType<double>());
 const QString kConfirm = QStringLiteral("Question YesNo [Processar Quotizações] Deseja iniciar o processamento de quotas?");
 // The closing message with the members processed, the dues posted and those left out.
 const QString kEnd = QStringLiteral("Information Ok [Gerar Quotas] Fim do processamento de quotizações\n\nAssociados "
@@ -68,7 +65,7 @@ void pick(QListWidget* list, int row)
 struct Due {
     QString empresa = "TAP";
     double rend1 = 1000, rend2 = 0;
-    QVariant percSindicato = kNull, percSeguro = kNull, seguro = 1, end = kNull;
+    QVariant percSindicato = kNullNumber, percSeguro = kNullNumber, seguro = 1, end = kNullNumber;
     QString dues = "15|15", total = "40.1";
 };
 Q_DECLARE_METATYPE(Due)
@@ -84,30 +81,26 @@ struct Choices {
 };
 Q_DECLARE_METATYPE(Choices)
 
-class GenerationTest : public QObject {
+class GenerationTest : public QObject, DatabaseFixture {
     Q_OBJECT
 
-    std::unique_ptr<TestDatabase> db;
     std::unique_ptr<frmGerarQuotas> dlg;
-    QString registry;
 
-    Connection& c() { return db->connection(); }
     // Member socio, staff number 1000 + socio, named "Associado socio".
     void member(int socio, const QVariant& fuv = "A1", const QVariant& empresa = "TAP", const QVariant& seguro = 0,
-                const QVariant& end = kNull)
+                const QVariant& end = kNullNumber)
     {
         c().execute(QStringLiteral("INSERT INTO tbSocios (socio_id, no_tap, nome, fuv, empresa, seguro, seguro_data_rescisao) "
                                    "VALUES (?, ?, ?, ?, ?, ?, ?)"),
                     {socio, QString::number(1000 + socio), QStringLiteral("Associado %1").arg(socio), fuv, empresa, seguro, end});
     }
-    void account(int socio, const QVariant& rend1, const QVariant& rend2, const QVariant& percSindicato = kNull,
-                 const QVariant& percSeguro = kNull, double total = 0)
+    void account(int socio, const QVariant& rend1, const QVariant& rend2, const QVariant& percSindicato = kNullNumber,
+                 const QVariant& percSeguro = kNullNumber, double total = 0)
     {
         c().execute(QStringLiteral("INSERT INTO tbQuotas_Socios (socio_id, ult_rend1, ult_rend2, ult_perc_sindicato, "
                                    "ult_perc_seguro, total_quotas, total_pago) VALUES (?, ?, ?, ?, ?, ?, 0)"),
                     {socio, rend1, rend2, percSindicato, percSeguro, total});
     }
-    QStringList rows(const QString& sql, const QVariantList& params = {}) { return rowsText(c(), sql, params); }
     // The dues of a month, "socio|tipo|quota" in number order.
     QStringList dues(int ano, int mes)
     {
@@ -115,7 +108,7 @@ class GenerationTest : public QObject {
                     {ano, mes});
     }
     GenerationOutcome run(int ano, int mes, int socio = 0) { return ProcessarQuotas(c(), ano, mes, socio, QDate(2003, 1, 20)); }
-    CliRun gerar(const QStringList& args) { return runQuotas(registry, QStringList{"gerar"} + args); }
+    CliRun gerar(const QStringList& args) { return quotas(QStringList{"gerar"} + args); }
 
     // The dialog shown and active, dated January 2003.
     frmGerarQuotas& open()
@@ -139,9 +132,7 @@ class GenerationTest : public QObject {
 private slots:
     void initTestCase()
     {
-        db = std::make_unique<TestDatabase>();
-        db->login();
-        registry = db->useAsSettings();
+        openDatabase();
         RecordingProgress::install();
     }
     void init()
@@ -206,7 +197,7 @@ private slots:
         QLocale::setDefault(QLocale(QLocale::Portuguese, QLocale::Portugal));
         member(1, "C2", "TAP", 1);
         member(2, "Z9", "PGA");
-        member(3, kNull, "XPT");
+        member(3, kNullNumber, "XPT");
         run(2003, 1);
         QLocale::setDefault(before);
         // The progress display steps once per member.
@@ -249,7 +240,7 @@ private slots:
     void emptyValuesAreReportedNotPosted()
     {
         member(1, "A1", "TAP", 1);
-        account(1, 1000.0, kNull);
+        account(1, 1000.0, kNullNumber);
         member(2, "A1", "NUL");
         member(3, "B9", "TAP");  // his account is created without a remuneration
         member(4, "A1", "NUL");
@@ -272,7 +263,7 @@ private slots:
     {
         for (int socio = 1; socio <= 3; ++socio)
             member(socio);
-        account(3, kNull, 0.0);
+        account(3, kNullNumber, 0.0);
         const CliRun refused = gerar({"--ano", "2003", "--mes", "1", "--no-tap", "x' OR '1'='1"});
         QVERIFY2(refused.status == 2 && refused.err.contains("Número de Empresa não existe!"), qPrintable(refused.err));
         QCOMPARE(gerar({"--ano", "2003", "--mes", "13"}).status, 2);
@@ -296,18 +287,12 @@ private slots:
     {
         for (int socio = 1; socio <= 4; ++socio)
             member(socio, "A1", "TAP", 1);
-        const bool lite = c().engine() == Engine::SQLite;
-        c().execute(lite ? QStringLiteral("CREATE TRIGGER refuse BEFORE INSERT ON tbQuotas_Movimentos WHEN NEW.socio_id = 3 "
-                                          "AND NEW.tipo = 2 BEGIN SELECT RAISE(ABORT, 'recusado'); END")
-                         : QStringLiteral("CREATE FUNCTION refuse() RETURNS trigger AS $$ BEGIN IF NEW.socio_id = 3 AND "
-                                          "NEW.tipo = 2 THEN RAISE EXCEPTION 'recusado'; END IF; RETURN NEW; END $$ LANGUAGE "
-                                          "plpgsql; CREATE TRIGGER refuse BEFORE INSERT ON tbQuotas_Movimentos FOR EACH ROW "
-                                          "EXECUTE FUNCTION refuse()"));
+        failWrites(c(), "INSERT", "tbQuotas_Movimentos", "NEW.socio_id = 3 AND NEW.tipo = 2");
         const CliRun failed = gerar({"--ano", "2003", "--mes", "1"});
-        c().execute(lite ? QStringLiteral("DROP TRIGGER refuse") : QStringLiteral("DROP FUNCTION refuse() CASCADE"));
+        failWrites(c(), "INSERT", "tbQuotas_Movimentos");
         QCOMPARE(failed.status, 1);
         QVERIFY2(failed.err.contains(QStringLiteral("O processamento de quotas parou no associado com o Nº Empresa 1003: "))
-                     && failed.err.contains(QStringLiteral("recusado")) && failed.out.isEmpty(),
+                     && failed.err.contains(QStringLiteral("falha simulada")) && failed.out.isEmpty(),
                  qPrintable(failed.err));
         // Nothing of member 3, not even his union due, his account or his number.
         QCOMPARE(dues(2003, 1), QStringList({"1|1|37.5", "1|2|37.5", "2|1|37.5", "2|2|37.5"}));
@@ -368,7 +353,7 @@ private slots:
         QFETCH(Choices, c);
         for (int socio = 1; socio <= 3; ++socio)
             member(socio);
-        account(2, 1000.0, kNull);
+        account(2, 1000.0, kNullNumber);
         ScriptedBoxes boxes;
         boxes.answer(c.yes ? Answer::Yes : Answer::No);
         frmGerarQuotas& d = open();

@@ -4,17 +4,15 @@
 
 #include "component/general.h"
 #include "component/shared_objects.h"
-#include "import/csv_import_source.h"
 #include "import/csv_reader.h"
 #include "import/frm_importar_quotas.h"
 #include "import/processar_importacao.h"
+#include "import/csv_import_source.h"
 #include "platform/components.h"
 #include "platform/errors.h"
-#include "support/cli_process.h"
+#include "support/database_fixture.h"
 #include "support/recording_progress.h"
-#include "support/rows_text.h"
 #include "support/scripted_boxes.h"
-#include "support/test_database.h"
 
 #include <QCheckBox>
 #include <QFile>
@@ -25,8 +23,6 @@ using namespace quotas;
 using namespace quotas::test;
 
 namespace {
-
-const QVariant kNull = QVariant(QMetaType::fromType<double>());
 
 // The boxes shown, as "icon: text".
 QStringList told(const ScriptedBoxes& boxes)
@@ -99,14 +95,11 @@ struct Selection {
 };
 Q_DECLARE_METATYPE(Selection)
 
-class ImportTest : public QObject {
+class ImportTest : public QObject, DatabaseFixture {
     Q_OBJECT
 
-    std::unique_ptr<TestDatabase> db;
-    QString registry;
     QStringList listings;
 
-    Connection& c() { return db->connection(); }
     void member(int id, const QString& noTap)
     {
         c().execute(QStringLiteral("INSERT INTO tbSocios (socio_id, no_tap, nome) VALUES (?, ?, 'Associado')"), {id, noTap});
@@ -132,20 +125,10 @@ class ImportTest : public QObject {
         movement(id, tipo, quota, pago);
         account(id, quota, pago);
     }
-    QStringList rows(const QString& sql) { return rowsText(c(), sql); }
     // Every value of the movements and the accounts.
     QStringList snapshot()
     {
         return rows("SELECT * FROM tbQuotas_Movimentos ORDER BY 1") + rows("SELECT * FROM tbQuotas_Socios ORDER BY 1");
-    }
-    // The employer's file, given to the import source as it stands.
-    QString useFile(const QByteArray& content)
-    {
-        const QString path = db->scratch(QStringLiteral("lista.csv"));
-        if (QFile file(path); file.open(QIODevice::WriteOnly))
-            file.write(content);
-        registerComponent("Dorvanta.General", [path] { return std::make_unique<CsvImportSource>(CsvImportSource::fixedFile(path)); });
-        return path;
     }
     static ImportSummary run(int month = 3, int tipo = 1) { return ProcessarImportacao(month, 2004, tipo); }
     // General::ImportarQuotas returns at once, the dialog stays.
@@ -154,9 +137,7 @@ class ImportTest : public QObject {
 private slots:
     void initTestCase()
     {
-        db = std::make_unique<TestDatabase>();
-        db->login();
-        registry = db->useAsSettings();
+        openDatabase();
         FrmImportarQuotas::pinToday(QDate(2004, 3, 15));
     }
     void init()
@@ -206,7 +187,7 @@ private slots:
     {
         QFETCH(QByteArray, bytes);
         QFETCH(QString, read);
-        const QString path = useFile(bytes);
+        const QString path = useImportFile(bytes);
         QStringList got;
         try {
             const CsvTable table = readCsvFile(path);
@@ -248,7 +229,7 @@ private slots:
         if (file == "cancelled")
             registerComponent("Dorvanta.General", [] { return std::make_unique<CsvImportSource>([] { return QString(); }); });
         else
-            useFile(file);
+            useImportFile(file);
         ScriptedBoxes boxes;
         run(month);
         QCOMPARE(told(boxes), shown);
@@ -267,9 +248,9 @@ private slots:
         QTest::newRow("comma 12,50") << Posting{10.0, 0.0, "\"12,50\"", false, "12.5|42.5|42.5"};
         QTest::newRow("beyond single precision") << Posting{10.0, 0.0, "123456.78", false, "123456.78|123486.78|123486.78"};
         // Compared with Null, neither "equals 0" nor "greater than" holds.
-        QTest::newRow("Null payment: left alone") << Posting{10.0, kNull, "8", false, ""};
-        QTest::newRow("Null charge, nothing paid") << Posting{kNull, 0.0, "8", false, "8|48|38"};
-        QTest::newRow("Null charge, paid") << Posting{kNull, 5.0, "8", false, ""};
+        QTest::newRow("Null payment: left alone") << Posting{10.0, kNullNumber, "8", false, ""};
+        QTest::newRow("Null charge, nothing paid") << Posting{kNullNumber, 0.0, "8", false, "8|48|38"};
+        QTest::newRow("Null charge, paid") << Posting{kNullNumber, 5.0, "8", false, ""};
     }
     void postsByTheRules()
     {
@@ -279,7 +260,7 @@ private slots:
         account(1, 40.0, 30.0);
         c().execute(QStringLiteral("INSERT INTO extras (Field0) VALUES ('antes')"));
         const QStringList before = snapshot();
-        useFile("no_tap;quota;nome\n100;" + p.deducted + ";Ana\n");
+        useImportFile("no_tap;quota;nome\n100;" + p.deducted + ";Ana\n");
         shared().SemSeparadorDecimal = p.wholeCents;
         ScriptedBoxes boxes;
         QCOMPARE(run().posted, p.posted.isEmpty() ? 0 : 1);
@@ -315,7 +296,7 @@ private slots:
         movement(1, 1, 10.0, 0.0);
         movement(1, 2, 20.0, 0.0);
         account(1, 30.0, 0.0, l.rend1);
-        useFile(l.file);
+        useImportFile(l.file);
         ScriptedBoxes boxes;
         QCOMPARE(run(3, l.tipo).posted, 1);
         QCOMPARE(rows("SELECT ult_rend1, ult_rend2, ult_quota_sindicato, ult_perc_sindicato, ult_quota_seguro, ult_perc_seguro "
@@ -334,13 +315,13 @@ private slots:
         movement(3, 1, 10.0, 0.0);
         charged(4, "400", 10.0);
         c().execute(QStringLiteral("INSERT INTO extras (Field0) VALUES ('da última vez')"));
-        useFile("\xEF\xBB\xBFno_tap;quota;nome;obs;c4;c5;c6;c7;c8;c9;c10;c11;c12;c13;c14;c15;c16;c17;c18;c19;c20;c21;c22\n"
-                "100;8.00;Ana;\n"
-                "999;7.00;Jo\xC3\xA3o;x\n"
-                "200;abc;Rui;y\n"
-                "300;6.00;Sem conta;z\n"
-                "400;;Vazio\n"                                                      // an empty amount; the short line leaves obs Null
-                "998;1;a;b;4;5;6;7;8;9;10;11;12;13;14;15;16;17;18;19;20;21;22\n");  // only 21 values are kept
+        useImportFile("\xEF\xBB\xBFno_tap;quota;nome;obs;c4;c5;c6;c7;c8;c9;c10;c11;c12;c13;c14;c15;c16;c17;c18;c19;c20;c21;c22\n"
+                      "100;8.00;Ana;\n"
+                      "999;7.00;Jo\xC3\xA3o;x\n"
+                      "200;abc;Rui;y\n"
+                      "300;6.00;Sem conta;z\n"
+                      "400;;Vazio\n"                                                      // an empty amount; the short line leaves obs Null
+                      "998;1;a;b;4;5;6;7;8;9;10;11;12;13;14;15;16;17;18;19;20;21;22\n");  // only 21 values are kept
         ScriptedBoxes boxes;
         QCOMPARE(run().posted, 1);
         QCOMPARE(told(boxes), QStringList{kRejected.arg(5)});
@@ -370,7 +351,7 @@ private slots:
         member(3, "555");  // no movement this month
         account(3, 0.0, 0.0);
         charged(4, "555", 10.0);
-        useFile("no_tap;quota\n\"x' OR '1'='1\";9.00\nx'y;8.00\n'200';7.00\n\" 200\";7.00\n200;12.00\n555;8.00\n");
+        useImportFile("no_tap;quota\n\"x' OR '1'='1\";9.00\nx'y;8.00\n'200';7.00\n\" 200\";7.00\n200;12.00\n555;8.00\n");
         ScriptedBoxes boxes;
         QCOMPARE(run().posted, 3);
         QCOMPARE(rows("SELECT a.socio_id, m.pago, a.total_pago FROM tbQuotas_Socios a LEFT JOIN tbQuotas_Movimentos m "
@@ -397,7 +378,7 @@ private slots:
             other->execute(QStringLiteral("UPDATE tbQuotas_Socios SET total_pago = total_pago + 5 WHERE socio_id = 1"));
             other->execute(QStringLiteral("UPDATE tbQuotas_Socios SET ult_rend1 = 777 WHERE socio_id = 2"));
         };
-        useFile("no_tap;quota;rend1\n300;7.00;900\n100;8.00;900\n200;8.00;900\n200;9.00;900\n");
+        useImportFile("no_tap;quota;rend1\n300;7.00;900\n100;8.00;900\n200;8.00;900\n200;9.00;900\n");
         ScriptedBoxes boxes;
         const ImportSummary summary = run();
         QCOMPARE(QList<int>({summary.posted, summary.failed}), QList<int>({3, 1}));
@@ -423,7 +404,7 @@ private slots:
             if (RecordingProgress::log().value == 1)
                 other->execute(QStringLiteral("SELECT pg_terminate_backend(?)"), {pid});
         };
-        useFile("no_tap;quota\n100;8.00\n200;8.00\n300;8.00\n");
+        useImportFile("no_tap;quota\n100;8.00\n200;8.00\n300;8.00\n");
         ScriptedBoxes boxes;
         try {
             run();
@@ -447,7 +428,7 @@ private slots:
         c().execute(QStringLiteral("CREATE UNIQUE INDEX refuse ON extras (Field0)"));  // the second 998 fails
         charged(1, "100", 10.0);
         c().execute(QStringLiteral("INSERT INTO extras (Field0) VALUES ('a'), ('b')"));
-        useFile("no_tap;quota\n998;1\n998;2\n100;8\n");
+        useImportFile("no_tap;quota\n998;1\n998;2\n100;8\n");
         ScriptedBoxes boxes;
         QVERIFY(!run().extrasSaved);
         c().execute(QStringLiteral("DROP INDEX refuse"));
@@ -463,10 +444,10 @@ private slots:
     void quotasImportar()
     {
         charged(1, "100", 10.0);
-        const QString file = useFile("no_tap;quota\n100;800\n999;100\n");
+        const QString file = useImportFile("no_tap;quota\n100;800\n999;100\n");
         const QString pdf = db->scratch(QStringLiteral("rejeitados.pdf"));
         const auto importar = [&](const QStringList& args, const QString& on = QString()) {
-            return runQuotas(registry, QStringList{"importar"} + args + QStringList{on.isEmpty() ? file : on});
+            return quotas(QStringList{"importar"} + args + QStringList{on.isEmpty() ? file : on});
         };
         const QStringList march = {"--ano", "2004", "--mes", "3", "--tipo", "1", "--sem-separador", "--pdf", pdf};
         const CliRun done = importar(march);
@@ -475,14 +456,14 @@ private slots:
                                             "Linhas deixadas como estavam (já lançadas): 0\nLinhas rejeitadas: 1\n"),
                  qPrintable(done.out + done.err));
         QCOMPARE(rows("SELECT pago FROM tbQuotas_Movimentos"), QStringList{"8"});
-        const CliRun none = importar(march, useFile("no_tap;quota\n100;800\n"));
+        const CliRun none = importar(march, useImportFile("no_tap;quota\n100;800\n"));
         QVERIFY2(none.status == 0 && !QFile::exists(pdf) && none.out.contains(pdf), qPrintable(none.out + none.err));
         const CliRun notCharged = importar({"--ano", "2004", "--mes", "7", "--tipo", "2"});
         QCOMPARE(notCharged.out, QStringLiteral("Não foram processados os registos de quotas referente a 7 / 2004. "
                                                 "Gere primeiro as quotas de Julho de 2004 (\"Gerar Quotas\").\n"));
         const std::pair<CliRun, QString> refusals[] = {{notCharged, "referente a 7 / 2004"},
-                                                       {importar(march, useFile("no_tap;valor\n100;800\n")), "campos no_tap ou quota"},
-                                                       {importar(march, useFile("no_tap;quota\n")), "registos para importar"},
+                                                       {importar(march, useImportFile("no_tap;valor\n100;800\n")), "campos no_tap ou quota"},
+                                                       {importar(march, useImportFile("no_tap;quota\n")), "registos para importar"},
                                                        {importar(march, file + "x"), "não existe"}};
         for (const auto& [refused, reason] : refusals)
             QVERIFY2(refused.status == 1 && refused.err.contains(reason), qPrintable(refused.err));
@@ -529,7 +510,7 @@ private slots:
     {
         QFETCH(Selection, s);
         charged(1, "100", 20.0, 0.0, 2);
-        const QString path = useFile("no_tap;quota\n100;" + s.amount + "\n");
+        const QString path = useImportFile("no_tap;quota\n100;" + s.amount + "\n");
         open();
         if (s.month == "março")
             list("List2")->currentItem()->setText(s.month);

@@ -3,18 +3,12 @@
 // row of the database changed by it, and "quotas importar --simular".
 
 #include "component/shared_objects.h"
-#include "import/csv_import_source.h"
 #include "import/import_verdict.h"
 #include "import/processar_importacao.h"
-#include "platform/components.h"
-#include "schema/schema.h"
-#include "support/cli_process.h"
+#include "support/database_fixture.h"
 #include "support/recording_progress.h"
-#include "support/rows_text.h"
 #include "support/scripted_boxes.h"
-#include "support/test_database.h"
 
-#include <QFile>
 #include <QTest>
 
 using namespace quotas;
@@ -39,13 +33,9 @@ QStringList described(const ImportVerdicts& verdicts)
 
 }  // namespace
 
-class ImportDryRunTest : public QObject {
+class ImportDryRunTest : public QObject, DatabaseFixture {
     Q_OBJECT
 
-    std::unique_ptr<TestDatabase> db;
-    QString registry;
-
-    Connection& c() { return db->connection(); }
     // Member id with staff number noTap charged quota and paid pago for March 2004; an account unless told otherwise.
     void charged(int id, const QString& noTap, double quota, double pago, bool withAccount = true)
     {
@@ -57,22 +47,6 @@ class ImportDryRunTest : public QObject {
             c().execute(u"INSERT INTO tbQuotas_Socios (socio_id, ult_rend1, ult_rend2, total_quotas, total_pago) VALUES (?, 1000, 0, ?, ?)"_s,
                         {id, quota, pago});
     }
-    QString useFile(const QByteArray& content)
-    {
-        const QString path = db->scratch(u"lista.csv"_s);
-        if (QFile file(path); file.open(QIODevice::WriteOnly))
-            file.write(content);
-        registerComponent("Dorvanta.General", [path] { return std::make_unique<CsvImportSource>(CsvImportSource::fixedFile(path)); });
-        return path;
-    }
-    // Every row of every table, to tell that nothing at all was written.
-    QStringList everything()
-    {
-        QStringList all;
-        for (const QString& table : schemaTables())
-            all << u"== "_s + table << rowsText(c(), u"SELECT * FROM %1 ORDER BY 1"_s.arg(table));
-        return all;
-    }
     // A month with one case of each verdict.
     QString month()
     {
@@ -83,14 +57,13 @@ class ImportDryRunTest : public QObject {
         charged(5, u"105"_s, 10, 0);
         charged(6, u"106"_s, 10, 0);
         c().execute(u"INSERT INTO extras (Field0) VALUES ('antes')"_s);
-        return useFile("no_tap;quota\n101;8.00\n102;12.00\n103;7.50\n999;1.00\n104;9.00\n105;abc\n101;8.00\n106;0\n");
+        return useImportFile("no_tap;quota\n101;8.00\n102;12.00\n103;7.50\n999;1.00\n104;9.00\n105;abc\n101;8.00\n106;0\n");
     }
 
 private slots:
     void initTestCase()
     {
-        db = std::make_unique<TestDatabase>();
-        registry = db->useAsSettings();
+        openDatabase();
     }
     void init()
     {
@@ -123,7 +96,7 @@ private slots:
         const ImportSummary summary = ProcessarImportacao(3, 2004, 1, &done);
         QCOMPARE(described(done), described(dry));
         QCOMPARE(summary.posted, dry.count(ImportVerdict::Kind::Post));
-        QCOMPARE(rowsText(c(), u"SELECT pago FROM tbQuotas_Movimentos ORDER BY socio_id"_s),
+        QCOMPARE(rows(u"SELECT pago FROM tbQuotas_Movimentos ORDER BY socio_id"_s),
                  (QStringList{"8", "12", "7.5", "0", "0", "0"}));
     }
 
@@ -141,7 +114,7 @@ private slots:
         QCOMPARE(out[8], u"A registar: 2 linha(s), 15,50 Esc; a deixar (já registadas): 3; a rejeitar: 3."_s);
         QCOMPARE(everything(), before);
         const CliRun clean = runQuotas(registry, {u"importar"_s, u"--simular"_s, u"--ano"_s, u"2004"_s, u"--mes"_s, u"3"_s, u"--tipo"_s, u"1"_s,
-                                                  useFile("no_tap;quota\n101;8.00\n")});
+                                                  useImportFile("no_tap;quota\n101;8.00\n")});
         QCOMPARE(clean.status, 0);
     }
 };

@@ -8,6 +8,7 @@
 
 #include "platform/connection.h"
 #include "platform/recordset.h"
+#include "support/database_fixture.h"
 
 #include <QDate>
 #include <QHash>
@@ -68,24 +69,9 @@ inline QStringList stateOf(Connection& c)
     return rows;
 }
 
-// Makes every UPDATE of a table fail where the condition (on OLD and NEW)
-// holds, as a database failure in the middle of a pass would; no condition
-// ends it. Triggers of another name stand beside it.
-inline void failUpdates(Connection& c, const QString& table, const QString& condition = {},
-                        const QString& name = QStringLiteral("fail"))
+inline void failUpdates(Connection& c, const QString& table, const QString& condition = {}, const QString& name = QStringLiteral("fail"))
 {
-    const bool lite = c.engine() == Engine::SQLite;
-    const QString trigger = name + u'_' + table;
-    c.execute(QStringLiteral("DROP TRIGGER IF EXISTS ") + trigger + (lite ? QString() : QStringLiteral(" ON ") + table));
-    if (!condition.isEmpty() && lite)
-        c.execute(QStringLiteral("CREATE TRIGGER %1 BEFORE UPDATE ON %2 WHEN %3 BEGIN SELECT RAISE(ABORT, 'falha simulada'); END")
-                      .arg(trigger, table, condition));
-    if (!condition.isEmpty() && !lite) {
-        c.execute(QStringLiteral("CREATE OR REPLACE FUNCTION %1() RETURNS trigger AS $$ BEGIN IF %2 THEN "
-                                 "RAISE EXCEPTION 'falha simulada'; END IF; RETURN NEW; END $$ LANGUAGE plpgsql")
-                      .arg(trigger, condition));
-        c.execute(QStringLiteral("CREATE TRIGGER %1 BEFORE UPDATE ON %2 FOR EACH ROW EXECUTE FUNCTION %1()").arg(trigger, table));
-    }
+    failWrites(c, QStringLiteral("UPDATE"), table, condition, name);
 }
 
 }  // namespace quotas::test

@@ -133,18 +133,13 @@ private slots:
         QTest::addColumn<double>("amount");
         QTest::addColumn<QString>("locale");
         QTest::addColumn<QString>("text");
-        QTest::newRow("plain") << 6.0 << "C"
-                               << "€ 6.00";
-        QTest::newRow("grouping") << 1234567.891 << "C"
-                                  << "€ 1,234,567.89";
-        QTest::newRow("negative in parentheses") << -2.5 << "C"
-                                                 << "(€ 2.50)";
-        QTest::newRow("user's separators") << 1234.5 << "de_DE"
-                                           << "€ 1.234,50";
-        QTest::newRow("tiny negative is zero") << -0.004 << "C"
-                                               << "€ 0.00";
-        QTest::newRow("beyond 64 bits of cents") << -1e20 << "C"
-                                                 << "(€ 100,000,000,000,000,000,000.00)";
+        const auto row = [](const char* tag, double amount, const char* locale, const char* text) { QTest::newRow(tag) << amount << locale << text; };
+        row("plain", 6.0, "C", "€ 6.00");
+        row("grouping", 1234567.891, "C", "€ 1,234,567.89");
+        row("negative in parentheses", -2.5, "C", "(€ 2.50)");
+        row("user's separators", 1234.5, "de_DE", "€ 1.234,50");
+        row("tiny negative is zero", -0.004, "C", "€ 0.00");
+        row("beyond 64 bits of cents", -1e20, "C", "(€ 100,000,000,000,000,000,000.00)");
     }
     void formatsMoney()
     {

@@ -20,46 +20,23 @@ private slots:
         QTest::addColumn<QString>("find");
         QTest::addColumn<QString>("replacement");
         QTest::addColumn<QString>("result");
-        QTest::newRow("number to SQL") << QVariant(12.5) << ","
-                                       << "."
-                                       << "12.5";
-        QTest::newRow("no grouping in numbers") << QVariant(1234567.25) << ","
-                                                << "."
-                                                << "1234567.25";
-        QTest::newRow("whole number") << QVariant(100000) << ","
-                                      << "."
-                                      << "100000";
+        const auto row = [](const char* tag, const QVariant& value, const char* find, const char* replacement, const char* result) {
+            QTest::newRow(tag) << value << find << replacement << result;
+        };
+        row("number to SQL", 12.5, ",", ".", "12.5");
+        row("no grouping in numbers", 1234567.25, ",", ".", "1234567.25");
+        row("whole number", 100000, ",", ".", "100000");
         // Regression: doubles of 100000 and above came out as "1E+05".
-        QTest::newRow("large double") << QVariant(100000.0) << ","
-                                      << "."
-                                      << "100000";
-        QTest::newRow("large double, local text") << QVariant(1234567.5) << "."
-                                                  << ","
-                                                  << "1234567,5";
-        QTest::newRow("small double") << QVariant(0.000001) << ","
-                                      << "."
-                                      << "0.000001";
-        QTest::newRow("text with points") << QVariant(QStringLiteral("1.234.5")) << "."
-                                          << ","
-                                          << "1,234,5";
-        QTest::newRow("nothing to replace") << QVariant(QStringLiteral("abc")) << "."
-                                            << ","
-                                            << "abc";
-        QTest::newRow("case matters") << QVariant(QStringLiteral("aAa")) << "A"
-                                      << "x"
-                                      << "axa";
-        QTest::newRow("empty find") << QVariant(QStringLiteral("a.b")) << ""
-                                    << ","
-                                    << "";
-        QTest::newRow("two-character find") << QVariant(QStringLiteral("abc")) << "ab"
-                                            << "x"
-                                            << "";
-        QTest::newRow("empty replacement") << QVariant(QStringLiteral("a.b")) << "."
-                                           << ""
-                                           << "";
-        QTest::newRow("two-character replacement") << QVariant(QStringLiteral("zzz")) << "."
-                                                   << ",,"
-                                                   << "";
+        row("large double", 100000.0, ",", ".", "100000");
+        row("large double, local text", 1234567.5, ".", ",", "1234567,5");
+        row("small double", 0.000001, ",", ".", "0.000001");
+        row("text with points", QStringLiteral("1.234.5"), ".", ",", "1,234,5");
+        row("nothing to replace", QStringLiteral("abc"), ".", ",", "abc");
+        row("case matters", QStringLiteral("aAa"), "A", "x", "axa");
+        row("empty find", QStringLiteral("a.b"), "", ",", "");
+        row("two-character find", QStringLiteral("abc"), "ab", "x", "");
+        row("empty replacement", QStringLiteral("a.b"), ".", "", "");
+        row("two-character replacement", QStringLiteral("zzz"), ".", ",,", "");
     }
     void replaces()
     {

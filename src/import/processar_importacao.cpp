@@ -7,6 +7,7 @@
 #include "generation/substituir_caracter.h"
 #include "import/import_recordset.h"
 #include "import/import_verdict.h"
+#include "import/month_dues.h"
 #include "import/rejects_listing.h"
 #include "platform/components.h"
 #include "platform/errors.h"
@@ -16,6 +17,7 @@
 #include "platform/transaction.h"
 
 #include <QLocale>
+#include <QSet>
 #include <QStringList>
 #include <cmath>
 #include <memory>
@@ -28,6 +30,8 @@ namespace {
 
 // The rejects list keeps at most this many values of a line.
 constexpr int kRejectColumns = 21;
+// The lines read, and matched with their dues, at a time.
+constexpr size_t kChunkLines = 500;
 
 RejectsListing& listingInUse()
 {
@@ -86,18 +90,19 @@ std::optional<double> readAmount(const QVariant& value, bool wholeCents)
 
 using Outcome = ImportVerdict::Kind;
 
+// One line of the employer's list: its values, Null where a short line
+// has none.
+struct SourceLine {
+    QVariantList values;
+    QVariant value(int column) const { return values.value(column); }
+};
+
 // The run's state for the lines.
 struct Lines {
-    Recordset& source;
-    Recordset& movements;
-    Recordset& accounts;
-    Connection& connection;
+    MonthDues& dues;
     int quotaColumn;
     int rend1Column;  // -1 when the source has none
     bool wholeCents;
-    int month;
-    int year;
-    int tipo;
 
     // Set for the dry run: the lines are decided and nothing is written. A
     // line it would post leaves its amount here, by quota_id, so that a later
@@ -105,15 +110,17 @@ struct Lines {
     std::unordered_map<qint64, double>* simulated = nullptr;
     // What was decided for the current line, and why.
     ImportVerdict verdict;
+    // The due the current line was matched with, for a failed post.
+    ChargedDue* due = nullptr;
 
-    QVariant movementAmount(const QString& column) const
+    QVariant dueAmount(const QVariant& stored) const
     {
         if (simulated) {
-            const auto posted = simulated->find(movements.value(QStringLiteral("quota_id")).toLongLong());
+            const auto posted = simulated->find(due->quotaId.toLongLong());
             if (posted != simulated->end())
                 return posted->second;  // quota and pago alike
         }
-        return movements.value(column);
+        return stored;
     }
     Outcome decided(Outcome kind, const QString& reason = QString())
     {
@@ -122,19 +129,23 @@ struct Lines {
         return kind;
     }
 
-    // Decides the current source line and, unless this is the dry run, posts it.
-    Outcome process()
+    // Decides a line and, unless this is the dry run, posts it.
+    Outcome process(const SourceLine& line)
     {
         verdict = ImportVerdict{};
-        const QVariant key = source.value(0);
+        due = nullptr;
+        const QVariant key = line.value(0);
         verdict.noTap = key.toString();
-        movements.moveFirst();
-        if (key.isNull() || !movements.find(QStringLiteral("no_tap"), key.toString()))
+        if (!key.isNull())
+            due = dues.find(key.toString());
+        if (!due)
             return decided(Outcome::Reject, QStringLiteral("sem quota gerada"));
         // A Null pago is not 0 and a Null quota is not below q: compared with
         // Null, the line is left alone.
-        const StoredNumber quota = readStoredAmount(movementAmount(QStringLiteral("quota")));
-        const StoredNumber pago = readStoredAmount(movementAmount(QStringLiteral("pago")));
+        const QVariant storedQuota = dueAmount(due->quota);
+        const QVariant storedPago = dueAmount(due->pago);
+        const StoredNumber quota = readStoredAmount(storedQuota);
+        const StoredNumber pago = readStoredAmount(storedPago);
         const double charged = quota.isNumber() ? quota.value : 0.0;
         const bool unpaid = pago.isNumber() && cents(pago.value) == 0;
         verdict.matched = true;
@@ -142,25 +153,23 @@ struct Lines {
         verdict.pagoBefore = cents(pago.isNumber() ? pago.value : 0.0);
         // The account of the member whose movement was found, so that a staff
         // number two members share can never split one line between them.
-        accounts.moveFirst();
-        if (!accounts.find(QStringLiteral("socio_id"), movements.value(QStringLiteral("socio_id"))))
+        DueAccount* account = dues.accountOf(*due);
+        if (!account)
             return decided(Outcome::Reject, QStringLiteral("sem conta"));
 
-        const std::optional<double> q = readAmount(source.value(quotaColumn), wholeCents);
+        const std::optional<double> q = readAmount(line.value(quotaColumn), wholeCents);
         if (!q)
             return decided(Outcome::Reject, QStringLiteral("valor ilegível"));
         std::optional<double> r;
         if (rend1Column >= 0) {
-            r = readAmount(source.value(rend1Column), wholeCents);
+            r = readAmount(line.value(rend1Column), wholeCents);
             if (!r)
                 return decided(Outcome::Reject, QStringLiteral("valor ilegível"));
         }
 
         // What the line is compared with and added to must be numbers.
         for (const QVariant& stored :
-             {movementAmount(QStringLiteral("quota")), movementAmount(QStringLiteral("pago")),
-              accounts.value(QStringLiteral("ult_rend1")), accounts.value(QStringLiteral("ult_rend2")),
-              accounts.value(QStringLiteral("total_quotas")), accounts.value(QStringLiteral("total_pago"))}) {
+             {storedQuota, storedPago, account->ultRend1, account->ultRend2, account->totalQuotas, account->totalPago}) {
             if (readStoredAmount(stored).isBad())
                 return decided(Outcome::Reject, QStringLiteral("valor ilegível na base de dados"));
         }
@@ -168,70 +177,35 @@ struct Lines {
             return decided(Outcome::LeaveAlone, unpaid ? QStringLiteral("desconto de 0,00") : QStringLiteral("já registada"));
         decided(Outcome::Post);
         verdict.quotaAfter = verdict.pagoAfter = cents(*q);
-        if (simulated) {
-            (*simulated)[movements.value(QStringLiteral("quota_id")).toLongLong()] = *q;
-            return Outcome::Post;
-        }
-
-        movements.setValue(QStringLiteral("rend1"), r ? QVariant(*r) : accounts.value(QStringLiteral("ult_rend1")));
-        movements.setValue(QStringLiteral("rend2"), 0.0);
-        movements.setValue(QStringLiteral("pago"), *q);
-        if (cents(charged) > 0)
-            accounts.addTo(QStringLiteral("total_quotas"), -charged);
-        movements.setValue(QStringLiteral("quota"), *q);
-
-        if (r) {
-            accounts.setValue(QStringLiteral("ult_rend1"), *r);
-            accounts.setValue(QStringLiteral("ult_rend2"), 0.0);
-        }
-        const double base = r ? *r
-                              : readStoredAmount(accounts.value(QStringLiteral("ult_rend1"))).value
-                                    + readStoredAmount(accounts.value(QStringLiteral("ult_rend2"))).value;
-        const QString due = tipo == 1 ? QStringLiteral("ult_quota_sindicato") : QStringLiteral("ult_quota_seguro");
-        const QString rate = tipo == 1 ? QStringLiteral("ult_perc_sindicato") : QStringLiteral("ult_perc_seguro");
-        accounts.setValue(due, *q);
-        // Without remunerations there is no rate to learn: the last one stays.
-        if (base != 0)
-            accounts.setValue(rate, *q / base);
-        accounts.setValue(QStringLiteral("ult_ano"), year);
-        accounts.setValue(QStringLiteral("ult_mes"), month);
-        accounts.addTo(QStringLiteral("total_quotas"), *q);
-        accounts.addTo(QStringLiteral("total_pago"), *q);
-
-        // The totals are written as "total + amount", so a payment another
-        // user records on the account meanwhile is kept.
-        Transaction line(connection);
-        movements.update();
-        accounts.update();
-        line.commit();
+        if (simulated)
+            (*simulated)[due->quotaId.toLongLong()] = *q;
+        else
+            dues.post(*due, *account, Deduction{*q, r, charged});
         return Outcome::Post;
     }
 
-    // After a rollback the line's two rows hold values the database may no
-    // longer have (another user's change is why it failed): read those two
-    // again, not the whole sets, so a failed line costs the same as a posted one.
+    // After a failed post the line's two rows may hold values the database
+    // no longer has (another user's change is why it failed): read those
+    // two again, so that a later line of that member is decided on them.
     void resynchronise()
     {
-        for (Recordset* set : {&movements, &accounts}) {
-            set->cancelUpdate();
-            if (!set->eof()) {
-                try {
-                    set->resync();
-                } catch (const QuotasError&) {
-                    // Left as read: a later line of that member fails and is listed too.
-                }
-            }
+        if (!due)
+            return;
+        try {
+            dues.reread(*due);
+        } catch (const QuotasError&) {
+            // Left as read: a later line of that member fails and is listed too.
         }
     }
 };
 
-void copyToRejects(Recordset& rejects, Recordset& source, const QString& reason)
+void copyToRejects(Recordset& rejects, const SourceLine& line, int columns, const QString& reason)
 {
     rejects.addNew();
     rejects.setValue(kRejectColumns, reason);
-    const int n = std::min(source.fieldCount(), kRejectColumns);
+    const int n = std::min(columns, kRejectColumns);
     for (int i = 0; i < n; ++i) {
-        const QVariant value = source.value(i);
+        const QVariant value = line.value(i);
         if (!value.isNull())  // a value without text form leaves its column empty
             rejects.setValue(i, value.toString());
     }
@@ -347,17 +321,10 @@ ImportSummary runImport(int month, int year, int tipo, ImportVerdicts* verdicts,
     progress.call("Iniciar", {source.recordCount(), QStringLiteral("Transferindo dados, aguarde uns momentos . . .")});
 
     Connection& connection = Data().SqlServer;
-    Recordset movements;
-    Recordset accounts;
-    const Lock lock = dryRun ? Lock::ReadOnly : Lock::Pessimistic;
+    MonthDues dues(connection, month, year, tipo);
+    bool charged = false;
     try {
-        movements.open(QStringLiteral("Select tbSocios.no_tap,tbQuotas_Movimentos.* from tbQuotas_Movimentos left outer "
-                                      "join tbsocios on tbQuotas_Movimentos.socio_id = tbSocios.socio_id where (ano=? "
-                                      "and mes=? and tipo=?)"),
-                       connection, Cursor::Keyset, lock, {year, month, tipo});
-        accounts.open(QStringLiteral("Select tbSocios.no_tap,tbQuotas_Socios.* from tbQuotas_Socios left outer join "
-                                     "tbsocios on tbQuotas_Socios.socio_id = tbSocios.socio_id"),
-                      connection, Cursor::Keyset, lock);
+        charged = dues.anyCharged();
     } catch (const QuotasError& e) {
         component.reset();
         progress.release();
@@ -368,62 +335,83 @@ ImportSummary runImport(int month, int year, int tipo, ImportVerdicts* verdicts,
 
     Recordset rejects;
     rejects.openInMemory(rejectColumns());
-    if (movements.eof()) {
+    if (!charged) {
         // Nothing to post against: the month was never generated. The
         // progress window goes first, so that the message is not behind it.
         progress.release();
         summary.refusal = QStringLiteral("Não foram processados os registos de quotas referente a %1 / %2.").arg(month).arg(year);
         msgBox(summary.refusal + QStringLiteral("\n\nGere primeiro as quotas de %1 de %2 (\"Gerar Quotas\").").arg(monthNames().value(month - 1, QString::number(month))).arg(year));
     } else {
-        Lines lines{source, movements, accounts, connection, quotaColumn, rend1Column, shared().SemSeparadorDecimal, month, year, tipo, nullptr, ImportVerdict{}};
+        Lines lines{dues, quotaColumn, rend1Column, shared().SemSeparadorDecimal, nullptr, ImportVerdict{}, nullptr};
         std::unordered_map<qint64, double> simulated;
         if (dryRun)
             lines.simulated = &simulated;
+        const int columns = source.fieldCount();
+        // Every later line would fail too: the run stops at the line it
+        // was at, and says so, rather than reject the rest of the file.
+        // lines: the data lines gone through, the one it stopped at included.
+        const auto stopped = [&](const QuotasError& e, int lines) {
+            component.reset();
+            progress.release();
+            return QuotasError(QStringLiteral("A importação das quotas de %1 / %2 parou na linha %3 do ficheiro: %4\n"
+                                              "As %5 linhas lançadas até aí ficam gravadas. Volte a importar o mesmo "
+                                              "ficheiro para a completar: as linhas já lançadas não se repetem.")
+                                   .arg(month)
+                                   .arg(year)
+                                   .arg(lines + 1)  // the first line names the columns
+                                   .arg(e.message())
+                                   .arg(summary.posted));
+        };
         LazyCommits lazy(connection);
+        std::vector<SourceLine> chunk;
         while (!source.eof()) {
-            ++summary.lines;
-            Outcome outcome = Outcome::Reject;
+            // A chunk of lines, and the dues they name in one read.
+            chunk.clear();
+            QSet<QString> staffNumbers;
+            for (; !source.eof() && chunk.size() < kChunkLines; source.moveNext()) {
+                SourceLine line;
+                for (int i = 0; i < columns; ++i)
+                    line.values << source.value(i);
+                if (!line.value(0).isNull())
+                    staffNumbers << line.value(0).toString();
+                chunk.push_back(std::move(line));
+            }
             try {
-                outcome = lines.process();
-            } catch (const ConnectionLostError& e) {
-                // Every later line would fail too: the run stops here, and
-                // says so, rather than reject the rest of the file.
-                component.reset();
-                progress.release();
-                throw QuotasError(QStringLiteral("A importação das quotas de %1 / %2 parou na linha %3 do ficheiro: %4\n"
-                                                 "As %5 linhas lançadas até aí ficam gravadas. Volte a importar o mesmo "
-                                                 "ficheiro para a completar: as linhas já lançadas não se repetem.")
-                                      .arg(month)
-                                      .arg(year)
-                                      .arg(summary.lines + 1)
-                                      .arg(e.message())
-                                      .arg(summary.posted));
-            } catch (const ConcurrencyError&) {
-                ++summary.failed;
-                lines.resynchronise();
-                lines.decided(Outcome::Reject, QStringLiteral("alterado por outro utilizador"));
-            } catch (const QuotasError&) {
-                ++summary.failed;
-                lines.resynchronise();
-                lines.decided(Outcome::Reject, QStringLiteral("não gravado"));
+                dues.read(staffNumbers.values());
+            } catch (const QuotasError& e) {
+                throw stopped(e, summary.lines + 1);
             }
-            if (verdicts) {
-                lines.verdict.line = summary.lines;
-                verdicts->lines.push_back(lines.verdict);
+            for (const SourceLine& line : chunk) {
+                ++summary.lines;
+                Outcome outcome = Outcome::Reject;
+                try {
+                    outcome = lines.process(line);
+                } catch (const ConnectionLostError& e) {
+                    throw stopped(e, summary.lines);
+                } catch (const ConcurrencyError&) {
+                    ++summary.failed;
+                    lines.resynchronise();
+                    lines.decided(Outcome::Reject, QStringLiteral("alterado por outro utilizador"));
+                } catch (const QuotasError&) {
+                    ++summary.failed;
+                    lines.resynchronise();
+                    lines.decided(Outcome::Reject, QStringLiteral("não gravado"));
+                }
+                if (verdicts) {
+                    lines.verdict.line = summary.lines;
+                    verdicts->lines.push_back(lines.verdict);
+                }
+                if (outcome == Outcome::Post)
+                    ++summary.posted;
+                else if (outcome == Outcome::Reject && !dryRun)
+                    copyToRejects(rejects, line, columns, lines.verdict.reason);
+                progress.call("setvalor", {1});
             }
-            if (outcome == Outcome::Post)
-                ++summary.posted;
-            else if (outcome == Outcome::Reject && !dryRun)
-                copyToRejects(rejects, source, lines.verdict.reason);
-            progress.call("setvalor", {1});
-            source.moveNext();
         }
         lazy.finish();
     }
 
     component.reset();  // the source goes with its component
-    movements.close();
-    accounts.close();
     progress.release();
 
     if (dryRun) {

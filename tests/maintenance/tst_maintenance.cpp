@@ -12,13 +12,9 @@
 #include "platform/animation.h"
 #include "platform/components.h"
 #include "schema/demo_data.h"
-#include "support/cli_process.h"
 #include "support/recording_progress.h"
-#include "support/rows_text.h"
 #include "support/scripted_boxes.h"
-#include "support/test_database.h"
 
-#include <QFile>
 #include <QProcess>
 #include <QProgressBar>
 #include <QPushButton>
@@ -89,19 +85,13 @@ void showAnd(const std::function<void(FrmManutencaoDados*)>& f)
 Q_DECLARE_METATYPE(Case)
 Q_DECLARE_METATYPE(CliCase)
 
-class MaintenanceTest : public QObject {
+class MaintenanceTest : public QObject, DatabaseFixture {
     Q_OBJECT
-
-    std::unique_ptr<TestDatabase> db;
-    QString registry;
-    Connection& c() { return db->connection(); }
 
 private slots:
     void initTestCase()
     {
-        db = std::make_unique<TestDatabase>();
-        registry = db->useAsSettings();
-        db->login();
+        openDatabase();
         // The Null repair rewrites only rows that hold a Null: rewriting any
         // other movement, on any run, fails the run.
         for (const QString key : {"A", "I", "H"})
@@ -257,7 +247,7 @@ private slots:
         QFETCH(CliCase, k);
         insertRows(c(), {"SA 1 80 10", "A 1 - 0 12.5 -", "I 2 4 4"});
         failUpdates(c(), kTable["SA"], k.condition);
-        const CliRun run = runQuotas(registry, k.args);
+        const CliRun run = quotas(k.args);
         QCOMPARE(run.status, k.expected.status);
         QCOMPARE(run.out, k.expected.out);
         QVERIFY2(run.err.contains(k.expected.err), qPrintable(run.err));
@@ -280,10 +270,7 @@ private slots:
         for (const QString& noTap : rowsText(b, QStringLiteral("SELECT DISTINCT s.no_tap FROM tbSocios s JOIN tbQuotas_Movimentos m "
                                                                "ON m.socio_id = s.socio_id WHERE s.no_tap IS NOT NULL")))
             lines += noTap.toUtf8() + ";1.00\n";
-        QFile file(busy.scratch(QStringLiteral("lista.csv")));
-        QVERIFY(file.open(QIODevice::WriteOnly) && file.write(lines) == lines.size());
-        file.close();
-        QProcess* import = startQuotas(this, settings, {"importar", "--ano", "2003", "--mes", "1", "--tipo", "1", file.fileName()});
+        QProcess* import = startQuotas(this, settings, {"importar", "--ano", "2003", "--mes", "1", "--tipo", "1", writeFile("lista.csv", lines)});
         QTRY_VERIFY_WITH_TIMEOUT(b.scalar(QStringLiteral("SELECT COUNT(*) FROM tbQuotas_Movimentos WHERE pago > 0")).toInt() > 0, 20000);
         const CliRun maintenance = runQuotas(settings, {"manutencao"});
         const CliRun imported = finishQuotas(import);

@@ -14,8 +14,7 @@
 #include "reports/report.h"
 #include "reports/report_engine.h"
 #include "reports/report_format.h"
-#include "support/cli_process.h"
-#include "support/test_database.h"
+#include "support/database_fixture.h"
 
 #include <QFile>
 #include <QPrintPreviewDialog>
@@ -98,11 +97,9 @@ struct Pages {
 }  // namespace
 Q_DECLARE_METATYPE(Pages)
 
-class ReportsTest : public QObject {
+class ReportsTest : public QObject, DatabaseFixture {
     Q_OBJECT
 
-    std::unique_ptr<TestDatabase> db;
-    QString registry;
     std::vector<ReportDocument> shown;
     QStringList titles;  // of the previews of the last showing
 
@@ -118,7 +115,7 @@ class ReportsTest : public QObject {
     {
         while (fields.size() < 5)
             fields << null;
-        db->connection().execute(u"INSERT INTO extras (Field0, Field1, Field2, Field3, Field4) VALUES (?, ?, ?, ?, ?)"_s, fields);
+        c().execute(u"INSERT INTO extras (Field0, Field1, Field2, Field3, Field4) VALUES (?, ?, ?, ?, ?)"_s, fields);
     }
     void letterhead(const QByteArray& text)
     {
@@ -154,8 +151,7 @@ class ReportsTest : public QObject {
 private slots:
     void initTestCase()
     {
-        db = std::make_unique<TestDatabase>();
-        registry = db->useAsSettings();
+        openDatabase();
         Report::setObserver([this](const ReportDocument& doc) { shown.push_back(doc); });
         qputenv("QUOTAS_DATA_DIR", db->scratch(u"data"_s).toUtf8());
         QDir().mkpath(db->scratch(u"data"_s));
@@ -223,7 +219,7 @@ private slots:
             addDebtor(a.id, QString::number(100 + a.id), QString::fromUtf8(a.name), a.charged, a.paid);
         addDebtor(10, null, u"Paulo"_s, 20);  // in the total, not in the number of records
         addDebtor(11, u""_s, u"Sara"_s, 30);  // an empty number counts
-        db->connection().execute(u"INSERT INTO tbQuotas_Socios (socio_id, total_quotas, total_pago) VALUES (99, 40.5, 0)"_s);
+        c().execute(u"INSERT INTO tbQuotas_Socios (socio_id, total_quotas, total_pago) VALUES (99, 40.5, 0)"_s);
         const ReportDocument doc = show(u"listing"_s);
         QStringList rows = texts(doc, {u"txtNoTap"_s, u"txtNome"_s, u"txtDivida"_s});
         QVERIFY(rows.removeOne(u"||40,50 Esc"_s));  // no member row; where a Null name sorts depends on the engine
@@ -375,13 +371,12 @@ private slots:
         addDebtor(2, u"100300"_s, u"Ana Conceição"_s, 12.5, 0, {u"Rua do Ouro, 5"_s, u"4000-322"_s, u"Porto"_s});
         reject({u"999001"_s, u"Linha Rejeitada"_s, u"12,50"_s, u"TAP"_s});
         const QString pdf = db->scratch(command + u".pdf"_s);
-        const CliRun r = runQuotas(registry, {command, u"--pdf"_s, pdf});
+        const CliRun r = quotas({command, u"--pdf"_s, pdf});
         QVERIFY2(r.status == 0, qPrintable(r.err));
-        QProcess text, fonts;
-        text.start(u"pdftotext"_s, {u"-layout"_s, pdf, u"-"_s});
+        QProcess fonts;
         fonts.start(u"pdffonts"_s, {pdf});
-        QVERIFY(text.waitForFinished() && fonts.waitForFinished());
-        QStringList printed = QString::fromUtf8(text.readAllStandardOutput()).replace(QRegularExpression(u"[ \\t]+"_s), u" "_s).replace(QRegularExpression(u" ?/ ?"_s), u" / "_s).split(u'\f');
+        QVERIFY(fonts.waitForFinished());
+        QStringList printed = pdfText(pdf).replace(QRegularExpression(u" ?/ ?"_s), u" / "_s).split(u'\f');
         printed.removeIf([](const QString& page) { return page.trimmed().isEmpty(); });
         QCOMPARE(printed.size(), pages.size());
         for (int i = 0; i < pages.size(); ++i) {
@@ -392,7 +387,7 @@ private slots:
         const QString used = QString::fromUtf8(fonts.readAllStandardOutput());
         QVERIFY2(used.contains(u"LiberationSans"_s) && (command == "cartas"_L1 || used.contains(u"LiberationSerif-Bold"_s)), qPrintable(used));
         // A usage problem exits with 2, a file that cannot be written with 1, each with a message.
-        const CliRun noPdf = runQuotas(registry, {command}), unwritable = runQuotas(registry, {command, u"--pdf"_s, u"/nonexistent/out.pdf"_s});
+        const CliRun noPdf = quotas({command}), unwritable = quotas({command, u"--pdf"_s, u"/nonexistent/out.pdf"_s});
         QCOMPARE((QList<int>{noPdf.status, unwritable.status}), (QList<int>{2, 1}));
         QVERIFY(!noPdf.err.isEmpty() && !unwritable.err.isEmpty());
     }

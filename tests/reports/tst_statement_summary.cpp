@@ -9,12 +9,9 @@
 #include "reports/month_summary.h"
 #include "reports/report.h"
 #include "reports/report_format.h"
-#include "support/cli_process.h"
-#include "support/test_database.h"
+#include "support/database_fixture.h"
 
 #include <QFile>
-#include <QProcess>
-#include <QRegularExpression>
 #include <QTest>
 
 using namespace quotas;
@@ -22,8 +19,6 @@ using namespace quotas::test;
 using namespace Qt::StringLiterals;
 
 namespace {
-
-const QVariant nullMoney = QVariant(QMetaType::fromType<double>());
 
 struct Movement {
     const char* table;  // "", "Inactivos", "Historico"
@@ -47,38 +42,35 @@ QString cents(qint64 c)
 }  // namespace
 Q_DECLARE_METATYPE(StatementCase)
 
-class StatementSummaryTest : public QObject {
+class StatementSummaryTest : public QObject, DatabaseFixture {
     Q_OBJECT
-
-    std::unique_ptr<TestDatabase> db;
-    QString registry;
 
     void member(int id, const QString& noTap, const QString& nome, const QVariant& totalQuotas = QVariant(),
                 const QVariant& totalPago = QVariant(), const QString& empresa = QString(), int seguro = 0)
     {
-        db->connection().execute(u"INSERT INTO tbSocios (socio_id, no_tap, nome, nome_guerra, morada1, code_postal1, "
-                                 "localidade1, empresa, seguro) VALUES (?, ?, ?, ?, 'Rua do Ouro, 5', '1100-053', 'Lisboa', ?, ?)"_s,
-                                 {id, noTap, nome, nome.section(u' ', 0, 0), empresa, seguro});
+        c().execute(u"INSERT INTO tbSocios (socio_id, no_tap, nome, nome_guerra, morada1, code_postal1, "
+                    "localidade1, empresa, seguro) VALUES (?, ?, ?, ?, 'Rua do Ouro, 5', '1100-053', 'Lisboa', ?, ?)"_s,
+                    {id, noTap, nome, nome.section(u' ', 0, 0), empresa, seguro});
         if (totalQuotas.isValid())
-            db->connection().execute(u"INSERT INTO tbQuotas_Socios (socio_id, ult_rend1, ult_rend2, total_quotas, total_pago) "
-                                     "VALUES (?, 1000, 0, ?, ?)"_s,
-                                     {id, totalQuotas, totalPago});
+            c().execute(u"INSERT INTO tbQuotas_Socios (socio_id, ult_rend1, ult_rend2, total_quotas, total_pago) "
+                        "VALUES (?, 1000, 0, ?, ?)"_s,
+                        {id, totalQuotas, totalPago});
     }
     void move(const Movement& m)
     {
         const QString table = u"tbQuotas_Movimentos"_s + (*m.table ? u"_"_s + QLatin1String(m.table) : QString());
-        db->connection().execute(u"INSERT INTO %1 (socio_id, data, ano, mes, tipo, ref, quota_no, quota, pago, doc_no) "
-                                 "VALUES (?, ?, ?, ?, ?, ?, ?, ?, ?, ?)"_s.arg(table),
-                                 {m.socio, QDate(m.ano, m.mes, 1), m.ano, m.mes, m.tipo,
-                                  m.tipo == 1 ? u"Sindicato"_s : u"Seguro"_s, m.ano * 100 + m.mes, m.quota, m.pago,
-                                  *m.doc ? QVariant(QString::fromUtf8(m.doc)) : QVariant(QMetaType::fromType<QString>())});
+        c().execute(u"INSERT INTO %1 (socio_id, data, ano, mes, tipo, ref, quota_no, quota, pago, doc_no) "
+                    "VALUES (?, ?, ?, ?, ?, ?, ?, ?, ?, ?)"_s.arg(table),
+                    {m.socio, QDate(m.ano, m.mes, 1), m.ano, m.mes, m.tipo,
+                     m.tipo == 1 ? u"Sindicato"_s : u"Seguro"_s, m.ano * 100 + m.mes, m.quota, m.pago,
+                     *m.doc ? QVariant(QString::fromUtf8(m.doc)) : QVariant(QMetaType::fromType<QString>())});
     }
     // Member 1 with active movements over three months, one inactive and one in the history.
     void statementMember(double totalQuotas, double totalPago)
     {
         member(1, u"100200"_s, u"Joaquim Gonçalves"_s, totalQuotas, totalPago);
         for (const Movement& m : {Movement{"", 1, 2004, 2, 2, 5.0, 0.0, ""}, Movement{"", 1, 2004, 1, 1, 30.0, 30.0, ""},
-                                  Movement{"", 1, 2004, 2, 1, 30.0, 10.0, "R-17"}, Movement{"", 1, 2004, 3, 1, 30.0, nullMoney, ""},
+                                  Movement{"", 1, 2004, 2, 1, 30.0, 10.0, "R-17"}, Movement{"", 1, 2004, 3, 1, 30.0, kNullNumber, ""},
                                   Movement{"Inactivos", 1, 2004, 2, 1, 12.0, 0.0, ""},
                                   Movement{"Historico", 1, 2003, 12, 1, 25.0, 25.0, ""}})
             move(m);
@@ -87,8 +79,7 @@ class StatementSummaryTest : public QObject {
 private slots:
     void initTestCase()
     {
-        db = std::make_unique<TestDatabase>();
-        registry = db->useAsSettings();
+        openDatabase();
         qputenv("QUOTAS_DATA_DIR", db->scratch(u"data"_s).toUtf8());
     }
     void init()
@@ -99,7 +90,7 @@ private slots:
 
     void statementRunsTheBalanceInOrder_data()
     {
-        QTest::addColumn<StatementCase>("c");
+        QTest::addColumn<StatementCase>("k");
         const QStringList active = {"01/2004|Sindicato|0,00|0,00|", "02/2004|Sindicato|20,00|20,00|",
                                     "02/2004|Seguro|5,00|25,00|", "03/2004|Sindicato|30,00|55,00|"};
         QTest::newRow("active, every month") << StatementCase{{1, 0, 0, false}, active, "95,00|40,00|55,00", false};
@@ -114,15 +105,15 @@ private slots:
     }
     void statementRunsTheBalanceInOrder()
     {
-        QFETCH(StatementCase, c);
+        QFETCH(StatementCase, k);
         statementMember(95, 40);
-        const MemberStatement s = readMemberStatement(db->connection(), c.request);
+        const MemberStatement s = readMemberStatement(c(), k.request);
         QStringList lines;
         for (const StatementLine& l : s.lines)
             lines << u"%1/%2|%3|%4|%5|%6"_s.arg(l.mes, 2, 10, QLatin1Char('0')).arg(l.ano).arg(l.ref, cents(l.open()), cents(l.balance), l.origin);
-        QCOMPARE(lines, c.lines);
-        QCOMPARE(u"%1|%2|%3"_s.arg(cents(s.charged), cents(s.paid), cents(s.open())), c.totals);
-        QCOMPARE(s.accountDiffers, c.differs);
+        QCOMPARE(lines, k.lines);
+        QCOMPARE(u"%1|%2|%3"_s.arg(cents(s.charged), cents(s.paid), cents(s.open())), k.totals);
+        QCOMPARE(s.accountDiffers, k.differs);
     }
 
     // The account is compared with every active movement, whatever the statement shows.
@@ -134,7 +125,7 @@ private slots:
         QTest::newRow("agrees") << QVariant(95.0) << QVariant(40.0) << false;
         QTest::newRow("a cent more charged") << QVariant(95.01) << QVariant(40.0) << true;
         QTest::newRow("paid differs") << QVariant(95.0) << QVariant(30.0) << true;
-        QTest::newRow("Null totals") << nullMoney << nullMoney << true;
+        QTest::newRow("Null totals") << kNullNumber << kNullNumber << true;
         QTest::newRow("no account") << QVariant() << QVariant() << true;
     }
     void statementTellsWhenTheAccountDiffers()
@@ -143,10 +134,10 @@ private slots:
         QFETCH(QVariant, totalPago);
         QFETCH(bool, differs);
         member(1, u"100200"_s, u"Joaquim Gonçalves"_s, totalQuotas, totalPago);
-        for (const Movement& m : {Movement{"", 1, 2004, 1, 1, 65.0, 40.0, ""}, Movement{"", 1, 2004, 2, 1, 30.0, nullMoney, ""},
+        for (const Movement& m : {Movement{"", 1, 2004, 1, 1, 65.0, 40.0, ""}, Movement{"", 1, 2004, 2, 1, 30.0, kNullNumber, ""},
                                   Movement{"Inactivos", 1, 2004, 2, 1, 12.0, 0.0, ""}})
             move(m);
-        const MemberStatement s = readMemberStatement(db->connection(), {1, 200402, 200402, true});
+        const MemberStatement s = readMemberStatement(c(), {1, 200402, 200402, true});
         QCOMPARE(s.accountDiffers, differs);
         const ReportDocument doc = layOutMemberStatement(s, Letterhead{});
         bool shown = false;
@@ -159,7 +150,7 @@ private slots:
     // agreement with the statements and with the debt listing.
     void summaryAddsUpTheMonthAndAgrees()
     {
-        db->connection().execute(u"INSERT INTO tbEmpresas (code, percent_sindicato) VALUES ('TAP', 0.015), ('SEM', NULL)"_s);
+        c().execute(u"INSERT INTO tbEmpresas (code, percent_sindicato) VALUES ('TAP', 0.015), ('SEM', NULL)"_s);
         member(1, u"101"_s, u"Ana Silva"_s, 40.0, 0.0, u"TAP"_s, 1);
         member(2, u"102"_s, u"Bruno Costa"_s, 33.33, 0.0, u"TAP"_s);
         member(3, u"103"_s, u"Carla Dias"_s, 25.1, 0.0, u"SEM"_s, 1);             // insured; her insurance cannot be computed
@@ -167,15 +158,15 @@ private slots:
         for (const Movement& m : {Movement{"", 1, 2004, 3, 1, 30.0, 30.0, ""},    // deducted by the list
                                   Movement{"", 1, 2004, 3, 2, 10.0, 4.0, "R-1"},  // paid at the desk
                                   Movement{"", 2, 2004, 3, 1, 33.33, 0.01, ""},
-                                  Movement{"", 2, 2004, 2, 1, 99.0, 0.0, ""},         // another month
-                                  Movement{"", 3, 2004, 3, 1, 25.1, nullMoney, ""}})  // unpaid, before maintenance
+                                  Movement{"", 2, 2004, 2, 1, 99.0, 0.0, ""},           // another month
+                                  Movement{"", 3, 2004, 3, 1, 25.1, kNullNumber, ""}})  // unpaid, before maintenance
             move(m);
-        db->connection().execute(u"INSERT INTO extras (Field0) VALUES ('999'), ('998')"_s);
-        db->connection().execute(u"UPDATE tbQuotas_Socios SET total_quotas = 10 WHERE socio_id = 1"_s);
+        c().execute(u"INSERT INTO extras (Field0) VALUES ('999'), ('998')"_s);
+        c().execute(u"UPDATE tbQuotas_Socios SET total_quotas = 10 WHERE socio_id = 1"_s);
         // Member 3's account lost its remunerations after this month was charged.
-        db->connection().execute(u"UPDATE tbQuotas_Socios SET ult_rend1 = NULL WHERE socio_id = 3"_s);
+        c().execute(u"UPDATE tbQuotas_Socios SET ult_rend1 = NULL WHERE socio_id = 3"_s);
 
-        const MonthSummary s = readMonthSummary(db->connection(), 2004, 3);
+        const MonthSummary s = readMonthSummary(c(), 2004, 3);
         QStringList figures;
         for (const MonthTypeFigures& f : {s.types[0], s.types[1], s.total()})
             figures << u"%1|%2|%3|%4|%5|%6|%7"_s.arg(f.ref).arg(f.members).arg(f.dues).arg(
@@ -187,14 +178,14 @@ private slots:
 
         qint64 statementsOpen = 0;
         for (int socio : {1, 2, 3})
-            statementsOpen += readMemberStatement(db->connection(), {socio, 200403, 200403, false}).open();
+            statementsOpen += readMemberStatement(c(), {socio, 200403, 200403, false}).open();
         QCOMPARE(statementsOpen, s.total().open);
 
         // Once the accounts hold this month only, the debt listing totals the same open amount.
-        db->connection().execute(u"DELETE FROM tbQuotas_Movimentos WHERE mes = 2"_s);
-        db->connection().execute(u"UPDATE tbQuotas_Socios SET total_quotas = (SELECT SUM(quota) FROM tbQuotas_Movimentos m "
-                                 "WHERE m.socio_id = tbQuotas_Socios.socio_id), total_pago = (SELECT SUM(COALESCE(pago, 0)) "
-                                 "FROM tbQuotas_Movimentos m WHERE m.socio_id = tbQuotas_Socios.socio_id)"_s);
+        c().execute(u"DELETE FROM tbQuotas_Movimentos WHERE mes = 2"_s);
+        c().execute(u"UPDATE tbQuotas_Socios SET total_quotas = (SELECT SUM(quota) FROM tbQuotas_Movimentos m "
+                    "WHERE m.socio_id = tbQuotas_Socios.socio_id), total_pago = (SELECT SUM(COALESCE(pago, 0)) "
+                    "FROM tbQuotas_Movimentos m WHERE m.socio_id = tbQuotas_Socios.socio_id)"_s);
         QString listed;
         Report::setObserver([&](const ReportDocument& doc) {
             for (const PlacedItem& item : doc.pages.back().items)
@@ -203,7 +194,7 @@ private slots:
         });
         writeDebtListingPdf(db->scratch(u"listagem.pdf"_s));
         Report::setObserver({});
-        QCOMPARE(listed, formatReportValue(double(readMonthSummary(db->connection(), 2004, 3).total().open) / 100.0,
+        QCOMPARE(listed, formatReportValue(double(readMonthSummary(c(), 2004, 3).total().open) / 100.0,
                                            u"#,##0.00 Esc"_s));
     }
 
@@ -214,24 +205,18 @@ private slots:
         member(2, u"100300"_s, u"Rita Sá"_s, 0.0, 0.0);
         member(3, u"100300"_s, u"Rui Sá"_s, 0.0, 0.0);
         const QString pdf = db->scratch(u"extrato.pdf"_s), resumo = db->scratch(u"resumo.pdf"_s), csv = db->scratch(u"resumo.csv"_s);
-        const CliRun statement = runQuotas(registry, {u"extrato"_s, u"--no-tap"_s, u"100200"_s, u"--ate"_s, u"2004-02"_s, u"--pdf"_s, pdf});
+        const CliRun statement = quotas({u"extrato"_s, u"--no-tap"_s, u"100200"_s, u"--ate"_s, u"2004-02"_s, u"--pdf"_s, pdf});
         QVERIFY2(statement.status == 0, qPrintable(statement.err));
-        const CliRun summary = runQuotas(registry, {u"resumo"_s, u"--ano"_s, u"2004"_s, u"--mes"_s, u"2"_s, u"--pdf"_s, resumo, u"--csv"_s, csv});
+        const CliRun summary = quotas({u"resumo"_s, u"--ano"_s, u"2004"_s, u"--mes"_s, u"2"_s, u"--pdf"_s, resumo, u"--csv"_s, csv});
         QVERIFY2(summary.status == 0, qPrintable(summary.err));
-        const auto text = [](const QString& file) {
-            QProcess p;
-            p.start(u"pdftotext"_s, {u"-layout"_s, file, u"-"_s});
-            p.waitForFinished();
-            return QString::fromUtf8(p.readAllStandardOutput()).replace(QRegularExpression(u"[ \\t]+"_s), u" "_s);
-        };
-        const QString s = text(pdf);
+        const QString s = pdfText(pdf);
         for (const QString& line : {u"Extrato de Quotas"_s, u"Nº Empresa: 100200"_s, u"Nome: Joaquim Gonçalves"_s,
                                     u"Localidade: 1100-053 Lisboa"_s, u"Movimentos: activos, até 02/2004"_s,
                                     u"Data Mês/Ano Tipo Nº Quota Quota Pago Em Aberto Documento Saldo Origem"_s,
                                     u"01-02-2004 02/2004 Sindicato 200402 30,00 10,00 20,00 R-17 20,00"_s,
                                     u"Total em aberto: 25,00 Esc"_s, u"Página: 1"_s})
             QVERIFY2(s.contains(line), qPrintable(line + u"\n--- not in:\n"_s + s));
-        const QString r = text(resumo);
+        const QString r = pdfText(resumo);
         for (const QString& line : {u"Resumo do Mês"_s, u"Fevereiro de 2004"_s, u"Sindicato 1 1 30,00 Esc 0,00 Esc 10,00 Esc 20,00 Esc"_s,
                                     u"Total 2 2 35,00 Esc 0,00 Esc 10,00 Esc 25,00 Esc"_s, u"Associados sem conta de quotas: 0"_s})
             QVERIFY2(r.contains(line), qPrintable(line + u"\n--- not in:\n"_s + r));
@@ -246,7 +231,7 @@ private slots:
         // An unknown or shared staff number, a bad month: usage, with a message.
         for (const QStringList& args : {QStringList{u"--no-tap"_s, u"999"_s}, QStringList{u"--no-tap"_s, u"100300"_s},
                                         QStringList{u"--no-tap"_s, u"100200"_s, u"--desde"_s, u"2004-13"_s}}) {
-            const CliRun bad = runQuotas(registry, QStringList{u"extrato"_s} + args + QStringList{u"--pdf"_s, pdf});
+            const CliRun bad = quotas(QStringList{u"extrato"_s} + args + QStringList{u"--pdf"_s, pdf});
             QVERIFY2(bad.status == 2 && !bad.err.isEmpty(), qPrintable(args.join(u' ') + u": "_s + bad.err));
         }
     }

@@ -6,11 +6,8 @@
 #include "platform/errors.h"
 #include "platform/recordset.h"
 #include "schema/schema.h"
-#include "support/cli_process.h"
-#include "support/rows_text.h"
-#include "support/test_database.h"
+#include "support/database_fixture.h"
 
-#include <QFile>
 #include <QProcess>
 #include <QTest>
 #include <limits>
@@ -18,16 +15,10 @@
 using namespace quotas;
 using namespace quotas::test;
 
-class OriginalShapeTest : public QObject {
+class OriginalShapeTest : public QObject, DatabaseFixture {
     Q_OBJECT
 
-    std::unique_ptr<TestDatabase> db;
-    QString registry;
-
-    Connection& c() { return db->connection(); }
     bool lite() { return c().engine() == Engine::SQLite; }
-    QStringList rows(const QString& sql) { return rowsText(c(), sql); }
-    CliRun quotas(const QStringList& args) { return runQuotas(registry, args); }
 
     // What the host's installations hold: tbSocios is theirs, with the
     // insurance end kept as text; the dues tables as init-db makes them on an
@@ -48,7 +39,7 @@ class OriginalShapeTest : public QObject {
                                    "VALUES (?, ?, ?, 'A1', 'TAP', ?, ?)"),
                     {socio, QString::number(1000 + socio), nome, seguro, end});
     }
-    void account(int socio, const QVariant& rend1, const QVariant& rate = QVariant(QMetaType::fromType<double>()))
+    void account(int socio, const QVariant& rend1, const QVariant& rate = kNullNumber)
     {
         c().execute(QStringLiteral("INSERT INTO tbQuotas_Socios (socio_id, ult_rend1, ult_rend2, ult_perc_sindicato, "
                                    "total_quotas, total_pago) VALUES (?, ?, 0, ?, 0, 0)"),
@@ -66,7 +57,7 @@ private slots:
     void aMonthOnTheOriginalShape()
     {
         originalShape();
-        const QVariant null = QVariant(QMetaType::fromType<double>());
+        const QVariant null = kNullNumber;
         c().execute(QStringLiteral("INSERT INTO tbEmpresas (code, nome, percent_sindicato) VALUES ('TAP', 'TAP', 0.015)"));
         c().execute(QStringLiteral("INSERT INTO tbfuvs (code, descrit, rend1) VALUES ('A1', 'A1', 800)"));
         member(1, "José Silva", 1, "31/03/2003");
@@ -109,11 +100,8 @@ private slots:
                               "8|1|7|15|0", "9|1|8|15|0", "8", "2|800"}));
 
         // Posted; left alone beside a Null amount; too large, infinite, unknown: listed.
-        QFile list(db->scratch("lista.csv"));
-        QVERIFY(list.open(QIODevice::WriteOnly));
-        list.write("no_tap;quota\n1001;15,00\n1005;1,00\n1006;1e308\n1007;2e23\n1008;6299999999999999999999.51\n9999;5\n");
-        list.close();
-        const CliRun imported = quotas({"importar", "--ano", "2003", "--mes", "1", "--tipo", "1", list.fileName()});
+        const QString list = writeFile("lista.csv", "no_tap;quota\n1001;15,00\n1005;1,00\n1006;1e308\n1007;2e23\n1008;6299999999999999999999.51\n9999;5\n");
+        const CliRun imported = quotas({"importar", "--ano", "2003", "--mes", "1", "--tipo", "1", list});
         QVERIFY2(imported.status != 1, qPrintable(imported.err));
         QCOMPARE(rows("SELECT socio_id, quota, pago FROM tbQuotas_Movimentos WHERE mes = 1 AND socio_id IN (1, 5) AND tipo = 1 "
                       "ORDER BY socio_id")

@@ -6,6 +6,8 @@
 #include "schema/schema.h"
 
 #include <QFile>
+#include <QProcess>
+#include <QRegularExpression>
 
 namespace quotas::test {
 
@@ -38,6 +40,14 @@ QString DatabaseFixture::useImportFile(const QByteArray& bytes)
     const QString path = writeFile(QStringLiteral("lista.csv"), bytes);
     registerComponent(QStringLiteral("Dorvanta.General"), [path] { return std::make_unique<CsvImportSource>(CsvImportSource::fixedFile(path)); });
     return path;
+}
+
+QString pdfText(const QString& path)
+{
+    QProcess p;
+    p.start(QStringLiteral("pdftotext"), {QStringLiteral("-layout"), path, QStringLiteral("-")});
+    p.waitForFinished();
+    return QString::fromUtf8(p.readAllStandardOutput()).replace(QRegularExpression(QStringLiteral("[ \\t]+")), QStringLiteral(" "));
 }
 
 void failWrites(Connection& c, const QString& event, const QString& table, const QString& condition, const QString& name)

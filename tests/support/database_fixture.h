@@ -35,6 +35,10 @@ protected:
 void failWrites(Connection& c, const QString& event, const QString& table, const QString& condition = {},
                 const QString& name = QStringLiteral("fail"));
 
+// The text of a PDF file as pdftotext lays it out, runs of spaces squeezed to
+// one, the pages separated by form feeds.
+QString pdfText(const QString& path);
+
 // A Null number, as a column of money holds it.
 inline const QVariant kNullNumber = QVariant(QMetaType::fromType<double>());
 

@@ -5,18 +5,25 @@
 #include "platform/errors.h"
 
 #include <QSqlQuery>
+#include <QSqlRecord>
 
 namespace quotas {
 
-bool DuesAccount::lock(Connection& connection, const QVariant& socio)
+namespace {
+
+const QString kColumns =
+    QStringLiteral("squota_id, ult_rend1, ult_rend2, ult_perc_sindicato, ult_perc_seguro, total_quotas");
+// The month's dues of the member, as bits (1 << tipo): the unique index of
+// the movements finds them.
+const QString kChargedTypes = QStringLiteral(
+    ", (SELECT SUM(DISTINCT 1 << m.tipo) FROM tbQuotas_Movimentos m WHERE m.socio_id = ? AND m.ano = ? AND m.mes = ? "
+    "AND m.tipo BETWEEN 1 AND 30)");
+
+}  // namespace
+
+bool DuesAccount::read(QSqlQuery& q)
 {
     *this = DuesAccount();
-    const Dialect& dialect = connection.dialect();
-    QSqlQuery& q = connection.run(
-        dialect.translate(QStringLiteral("SELECT squota_id, ult_rend1, ult_rend2, ult_perc_sindicato, ult_perc_seguro, "
-                                         "total_quotas FROM tbQuotas_Socios WHERE (socio_id=?) ORDER BY squota_id")
-                          + dialect.forUpdate()),
-        {socio});
     const bool found = q.next();
     if (found) {
         m_key = q.value(0);
@@ -25,9 +32,39 @@ bool DuesAccount::lock(Connection& connection, const QVariant& socio)
         m_percSindicato = q.value(3);
         m_percSeguro = q.value(4);
         m_total = readStoredAmount(q.value(5));
+        if (q.record().count() > 6)
+            m_chargedTypes = q.value(6).toUInt();
     }
     q.finish();
     return found;
+}
+
+bool DuesAccount::lock(Connection& connection, const QVariant& socio, int ano, int mes)
+{
+    const Dialect& dialect = connection.dialect();
+    const bool month = ano > 0;
+    // Read after the member's lock was taken, the month's dues are those
+    // every run that visited him before has committed.
+    return read(connection.run(
+        dialect.translate(QStringLiteral("SELECT %1%2 FROM tbQuotas_Socios WHERE (socio_id=?) ORDER BY squota_id")
+                              .arg(kColumns, month ? kChargedTypes : QString())
+                          + dialect.forUpdate()),
+        month ? QVariantList{socio, ano, mes, socio} : QVariantList{socio}));
+}
+
+void DuesAccount::create(Connection& connection, const QVariant& socio, int ano, int mes, const QVariant& rend1)
+{
+    // The new row is this transaction's own until it commits: returning it
+    // spares reading it again.
+    const bool found = read(connection.run(
+        connection.dialect().translate(
+            QStringLiteral("INSERT INTO tbQuotas_Socios (socio_id, ult_ano, ult_mes, ult_rend1, ult_rend2, "
+                           "ult_quota_sindicato, ult_quota_seguro, total_quotas, total_pago) VALUES (?,?,?,?,0,0,0,0,0) "
+                           "RETURNING %1%2")
+                .arg(kColumns, kChargedTypes)),
+        {socio, ano, mes, rend1, socio, ano, mes}));
+    if (!found)
+        throw DbError(QStringLiteral("Não foi possível criar a conta de quotas do associado."));
 }
 
 void DuesAccount::charge(DueType type, double amount, int ano, int mes)

@@ -5,6 +5,8 @@
 
 #include <QVariant>
 
+class QSqlQuery;
+
 namespace quotas {
 
 class Connection;
@@ -17,8 +19,17 @@ public:
     // Reads the member's account; on PostgreSQL its row stays locked until
     // the transaction ends, so a second run visiting him waits here and then
     // sees what this one posted (SQLite's writer lock does the same).
-    // False when he has no account.
-    bool lock(Connection& connection, const QVariant& socio);
+    // False when he has no account. Given a month, the same read also says
+    // which dues of that month he already has (charged()).
+    bool lock(Connection& connection, const QVariant& socio, int ano = 0, int mes = 0);
+    // Adds the member's account, with the month as its last and rend1 as
+    // its remuneration, and reads it back as lock() does. Must run under the
+    // member's lock, after lock() found none.
+    void create(Connection& connection, const QVariant& socio, int ano, int mes, const QVariant& rend1);
+
+    // The types (bit tipo set) of the month's dues he had when his account
+    // was read.
+    unsigned charged() const { return m_chargedTypes; }
 
     const QVariant& rend1() const { return m_rend1; }
     const QVariant& rend2() const { return m_rend2; }
@@ -38,6 +49,8 @@ public:
     void save(Connection& connection);
 
 private:
+    bool read(QSqlQuery& q);
+
     QVariant m_key;
     QVariant m_rend1;
     QVariant m_rend2;
@@ -50,6 +63,7 @@ private:
     int m_ano = 0;
     int m_mes = 0;
     bool m_charged = false;
+    unsigned m_chargedTypes = 0;
 };
 
 }  // namespace quotas

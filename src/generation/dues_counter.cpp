@@ -5,7 +5,7 @@
 
 namespace quotas {
 
-int DuesCounter::next()
+int DuesCounter::reserve(int count)
 {
     const Dialect& dialect = m_connection.dialect();
     const QString address = dialect.rowAddress();
@@ -22,12 +22,12 @@ int DuesCounter::next()
         const QVariant row = m_connection.scalar(m_firstRow);
         if (row.isValid()) {
             const QVariant number = m_connection.scalar(
-                QStringLiteral("UPDATE tbcontadores SET quotas = COALESCE(quotas, 0) + 1 WHERE %1 = CAST(? AS %2) "
+                QStringLiteral("UPDATE tbcontadores SET quotas = COALESCE(quotas, 0) + ? WHERE %1 = CAST(? AS %2) "
                                "RETURNING quotas")
                     .arg(address, dialect.engine() == Engine::SQLite ? QStringLiteral("INTEGER") : QStringLiteral("tid")),
-                {row.toString()});
+                {count, row.toString()});
             if (number.isValid())
-                return number.toInt();
+                return number.toInt() - count + 1;
             continue;  // changed by someone outside the lock: read it again
         }
         // An empty table. Those who would add the first row queue on one
@@ -35,7 +35,7 @@ int DuesCounter::next()
         m_connection.lock(Connection::LockSpace::FirstCounter);
         if (m_connection.scalar(m_firstRow).isValid())
             continue;
-        m_connection.execute(QStringLiteral("INSERT INTO tbcontadores (quotas) VALUES (1)"));
+        m_connection.execute(QStringLiteral("INSERT INTO tbcontadores (quotas) VALUES (?)"), {count});
         return 1;
     }
     throw DbError(QStringLiteral("Não foi possível obter o número da quota na tabela tbcontadores."));

@@ -8,8 +8,6 @@
 #include "platform/connection.h"
 #include "platform/recordset.h"
 
-#include <QSqlQuery>
-
 namespace quotas {
 
 namespace {
@@ -28,21 +26,6 @@ QString memberLabel(const Recordset& member)
     const QString noTap = member.value(QStringLiteral("no_tap")).toString().trimmed();
     return noTap.isEmpty() ? QStringLiteral("sem número (associado %1)").arg(member.value(QStringLiteral("no")).toLongLong())
                            : noTap;
-}
-
-unsigned chargedTypes(Connection& connection, const QVariant& socio, int ano, int mes)
-{
-    QSqlQuery& q = connection.run(connection.dialect().translate(QStringLiteral(
-                                      "SELECT tipo FROM tbQuotas_Movimentos WHERE (socio_id=?) AND (ano= ?) AND (mes= ?)")),
-                                  {socio, ano, mes});
-    unsigned charged = 0;
-    while (q.next()) {
-        const int tipo = q.value(0).toInt();
-        if (tipo > 0 && tipo < 32)
-            charged |= 1u << tipo;
-    }
-    q.finish();
-    return charged;
 }
 
 bool LancarQuota(PostingContext& ctx, DueType type)
@@ -104,15 +87,32 @@ bool LancarQuota(PostingContext& ctx, DueType type)
     const double amount = dueAmount(roundCents(rend1.value), roundCents(rend2.value), *rate);
     if (!amountInRange(amount))
         return unreadable(QStringLiteral("quota"), QStringLiteral("valor calculado fora dos limites de ±9.999.999.999,99"));
-    const int number = ctx.counter.next();
-    ctx.connection.execute(QStringLiteral("INSERT INTO tbQuotas_Movimentos (data, ano, mes, socio_id, ref, rend1, rend2, "
-                                          "quota, pago, tipo, quota_no) VALUES (?, ?, ?, ?, ?, ?, ?, ?, 0, ?, ?)"),
-                           {ctx.today, ctx.ano, ctx.mes, ctx.member.value(QStringLiteral("no")), info.ref,
-                            roundCents(rend1.value), roundCents(rend2.value), amount, info.tipo, number});
-    ctx.account.charge(type, amount, ctx.ano, ctx.mes);
+    ctx.dues.append({type, roundCents(rend1.value), roundCents(rend2.value), amount});
     ctx.charged |= 1u << info.tipo;
-    ++ctx.outcome.posted;
     return true;
+}
+
+void WriteDues(PostingContext& ctx)
+{
+    if (ctx.dues.isEmpty())
+        return;
+    QString sql = QStringLiteral("INSERT INTO tbQuotas_Movimentos (data, ano, mes, socio_id, ref, rend1, rend2, quota, pago, "
+                                 "tipo, quota_no) VALUES ");
+    QVariantList params;
+    int number = ctx.counter.reserve(int(ctx.dues.size()));
+    for (const PostingContext::Due& due : std::as_const(ctx.dues)) {
+        const DueTypeInfo& info = dueTypeInfo(due.type);
+        if (!params.isEmpty())
+            sql += QStringLiteral(", ");
+        sql += QStringLiteral("(?, ?, ?, ?, ?, ?, ?, ?, 0, ?, ?)");
+        params << ctx.today << ctx.ano << ctx.mes << ctx.member.value(QStringLiteral("no")) << info.ref << due.rend1
+               << due.rend2 << due.amount << info.tipo << number++;
+    }
+    ctx.connection.execute(sql, params);
+    for (const PostingContext::Due& due : std::as_const(ctx.dues))
+        ctx.account.charge(due.type, due.amount, ctx.ano, ctx.mes);
+    ctx.outcome.posted += int(ctx.dues.size());
+    ctx.dues.clear();
 }
 
 }  // namespace quotas

@@ -3,6 +3,7 @@
 #include "generation/due_rules.h"
 
 #include <QDate>
+#include <QList>
 
 namespace quotas {
 
@@ -27,20 +28,28 @@ struct PostingContext {
     // The types the member is already charged with for the month, read
     // under the account's lock (bit tipo set).
     unsigned charged = 0;
+    // The dues decided for the member, in the order they are numbered.
+    struct Due {
+        DueType type;
+        double rend1;
+        double rend2;
+        double amount;
+    };
+    QList<Due> dues;
 };
 
-// The types (bit tipo) the member is already charged with for the month:
-// one query on the unique index of the movements.
-unsigned chargedTypes(Connection& connection, const QVariant& socio, int ano, int mes);
-
-// Posts the due of one type for the current member unless he is already
+// Decides the due of one type for the current member unless he is already
 // charged with it for the month or, for the insurance, not insured then:
-// the movement row with the next number and the amount, and the charge on
-// ctx.account (saved by the caller with the member's other writes). Must
-// run inside the member's transaction. A due whose remunerations or
+// its amount goes to ctx.dues, for WriteDues. A due whose remunerations or
 // employer rate are empty is not posted and is counted in ctx.outcome.
-// Returns whether a movement was written.
+// Returns whether a due was decided.
 bool LancarQuota(PostingContext& ctx, DueType type);
+
+// Writes the member's decided dues: their numbers in one change of the
+// counter, the movement rows in one statement, and their charges on
+// ctx.account (saved by the caller with the member's other writes). Must
+// run inside the member's transaction.
+void WriteDues(PostingContext& ctx);
 
 // The current member in messages: his staff number, or his key when he has none.
 QString memberLabel(const Recordset& member);

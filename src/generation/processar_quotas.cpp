@@ -31,10 +31,6 @@ const QString kMembersSql = QStringLiteral(
     "(SELECT COUNT(*) FROM tbQuotas_Movimentos m WHERE m.socio_id = s.socio_id AND m.ano = ? AND m.mes = ? "
     "AND m.tipo = 2) AS seguro_lancado "
     "FROM tbsocios s WHERE s.socio_id <= ?%1 ORDER BY s.socio_id");
-const QString kNewAccountSql = QStringLiteral(
-    "INSERT INTO tbQuotas_Socios (socio_id, ult_ano, ult_mes, ult_rend1, ult_rend2, ult_quota_sindicato, "
-    "ult_quota_seguro, total_quotas, total_pago) VALUES (?,?,?,?,0,0,0,0,0)");
-
 // A member whose category is not known starts from this remuneration.
 constexpr double kUnknownCategoryRend1 = 100000;
 
@@ -82,15 +78,12 @@ public:
         // Whatever indexes the tables have, a second run visiting the member
         // waits here, then finds the account and the dues this one wrote.
         m_connection.lockMember(no);
-        if (!m_account.lock(m_connection, no)) {
+        if (!m_account.lock(m_connection, no, m_ano, m_mes))
             createAccount(member);
-            if (!m_account.lock(m_connection, no))
-                throw DbError(QStringLiteral("Não foi possível criar a conta de quotas do associado."));
-        }
-        PostingContext ctx{m_connection, m_ano, m_mes, m_today, member,
-                           m_account, m_employers, m_counter, m_outcome, chargedTypes(m_connection, no, m_ano, m_mes)};
+        PostingContext ctx{m_connection, m_ano, m_mes, m_today, member, m_account, m_employers, m_counter, m_outcome, m_account.charged(), {}};
         LancarQuota(ctx, DueType::Sindicato);
         LancarQuota(ctx, DueType::Seguro);
+        WriteDues(ctx);
         m_account.save(m_connection);
         tx.commit();
         ++m_outcome.members;
@@ -120,8 +113,8 @@ private:
             rend1 = categoryRend1.isNumber() ? QVariant(roundCents(categoryRend1.value))
                                              : QVariant(QMetaType::fromType<double>());
         }
-        m_outcome.accountsCreated +=
-            m_connection.execute(kNewAccountSql, {member.value(QStringLiteral("no")), m_ano, m_mes, rend1});
+        m_account.create(m_connection, member.value(QStringLiteral("no")), m_ano, m_mes, rend1);
+        ++m_outcome.accountsCreated;
     }
 
     Connection& m_connection;

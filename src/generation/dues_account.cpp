@@ -13,11 +13,11 @@ namespace {
 
 const QString kColumns =
     QStringLiteral("squota_id, ult_rend1, ult_rend2, ult_perc_sindicato, ult_perc_seguro, total_quotas");
-// The month's dues of the member, as bits (1 << tipo): the unique index of
-// the movements finds them.
+// Which of the month's two dues the member has, as bits (1 << tipo): the
+// unique index of the movements finds them.
 const QString kChargedTypes = QStringLiteral(
-    ", (SELECT SUM(DISTINCT 1 << m.tipo) FROM tbQuotas_Movimentos m WHERE m.socio_id = ? AND m.ano = ? AND m.mes = ? "
-    "AND m.tipo BETWEEN 1 AND 30)");
+    ", (SELECT MAX(CASE WHEN m.tipo = 1 THEN 2 ELSE 0 END) + MAX(CASE WHEN m.tipo = 2 THEN 4 ELSE 0 END) "
+    "FROM tbQuotas_Movimentos m WHERE m.socio_id = ? AND m.ano = ? AND m.mes = ?)");
 
 }  // namespace
 
@@ -54,16 +54,11 @@ bool DuesAccount::lock(Connection& connection, const QVariant& socio, int ano, i
 
 void DuesAccount::create(Connection& connection, const QVariant& socio, int ano, int mes, const QVariant& rend1)
 {
-    // The new row is this transaction's own until it commits: returning it
-    // spares reading it again.
-    const bool found = read(connection.run(
-        connection.dialect().translate(
-            QStringLiteral("INSERT INTO tbQuotas_Socios (socio_id, ult_ano, ult_mes, ult_rend1, ult_rend2, "
-                           "ult_quota_sindicato, ult_quota_seguro, total_quotas, total_pago) VALUES (?,?,?,?,0,0,0,0,0) "
-                           "RETURNING %1%2")
-                .arg(kColumns, kChargedTypes)),
-        {socio, ano, mes, rend1, socio, ano, mes}));
-    if (!found)
+    connection.execute(QStringLiteral("INSERT INTO tbQuotas_Socios (socio_id, ult_ano, ult_mes, ult_rend1, ult_rend2, "
+                                      "ult_quota_sindicato, ult_quota_seguro, total_quotas, total_pago) "
+                                      "VALUES (?,?,?,?,0,0,0,0,0)"),
+                       {socio, ano, mes, rend1});
+    if (!lock(connection, socio, ano, mes))
         throw DbError(QStringLiteral("Não foi possível criar a conta de quotas do associado."));
 }
 

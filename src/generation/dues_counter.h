@@ -26,6 +26,7 @@ public:
 private:
     Connection& m_connection;
     QString m_firstRow;  // the locking read of the first row's address
+    QString m_take;      // the change of the first row, returning its new count
 };
 
 }  // namespace quotas

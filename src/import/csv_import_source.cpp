@@ -46,7 +46,7 @@ QObject* CsvImportSource::build()
     const QString path = m_chooser();
     if (path.isEmpty())
         return nullptr;
-    return ImportRecordset::fromTable(readCsvFile(path), this);
+    return new ImportRecordset(CsvLines::open(path), this);
 }
 
 }  // namespace quotas

@@ -23,9 +23,10 @@ public:
     static FileChooser fixedFile(const QString& path);
 
     // The lines of the chosen file as an ImportRecordset owned by this
-    // object; nullptr when no file was chosen (nothing to import, nothing to
-    // say). An unreadable or malformed file throws QuotasError with the
-    // reason, before anything is imported.
+    // object, which reads them as they are asked for; nullptr when no file
+    // was chosen (nothing to import, nothing to say). An unreadable or
+    // malformed file throws QuotasError with the reason, before anything is
+    // imported.
     Q_INVOKABLE QObject* build();
 
 private:

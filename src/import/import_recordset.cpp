@@ -4,19 +4,26 @@
 
 namespace quotas {
 
-ImportRecordset* ImportRecordset::fromTable(const CsvTable& table, QObject* parent)
+ImportRecordset::ImportRecordset(std::unique_ptr<CsvLines> lines, QObject* parent)
+    : QObject(parent), m_lines(std::move(lines))
 {
-    auto* set = new ImportRecordset(parent);
-    Recordset& rows = set->rows();
-    rows.openInMemory(table.header);
-    for (const QStringList& line : table.rows) {
-        rows.addNew();
-        for (int i = 0; i < line.size(); ++i)
-            rows.setValue(i, line[i]);
-    }
-    if (!table.rows.isEmpty())
-        rows.moveFirst();
-    return set;
+}
+
+ImportRecordset::~ImportRecordset() = default;
+
+const QStringList& ImportRecordset::columns() const
+{
+    return m_lines->header();
+}
+
+qsizetype ImportRecordset::lineCount() const
+{
+    return m_lines->lineCount();
+}
+
+bool ImportRecordset::next(QStringList& line)
+{
+    return m_lines->next(line);
 }
 
 }  // namespace quotas

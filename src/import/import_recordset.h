@@ -1,31 +1,32 @@
 #pragma once
 
-#include "platform/recordset.h"
-
 #include <QObject>
+#include <QStringList>
+#include <memory>
 
 namespace quotas {
 
-struct CsvTable;
+class CsvLines;
 
 // What the build of an import source ("Dorvanta.General") returns, late
-// bound as a QObject*: the employer's lines as an in-memory result set of
-// text columns, named as the source names them, positioned on its first
-// line. The source owns it (it is the source's child) and it lives until
-// the source is released. The run takes any other result, or none, for
-// "no usable set".
+// bound as a QObject*: the employer's lines, text values under the names the
+// source gives its columns, read one at a time from the start. The source
+// owns it (it is the source's child) and it lives until the source is
+// released. The run takes any other result, or none, for "no usable set".
 class ImportRecordset : public QObject {
     Q_OBJECT
 public:
-    explicit ImportRecordset(QObject* parent = nullptr) : QObject(parent) {}
+    ImportRecordset(std::unique_ptr<CsvLines> lines, QObject* parent);
+    ~ImportRecordset() override;
 
-    Recordset& rows() { return m_rows; }
-
-    // The table's lines; missing values at the end of a short line are Null.
-    static ImportRecordset* fromTable(const CsvTable& table, QObject* parent);
+    const QStringList& columns() const;
+    qsizetype lineCount() const;
+    // The next line; missing values at the end of a short line are left
+    // out. False after the last.
+    bool next(QStringList& line);
 
 private:
-    Recordset m_rows;
+    std::unique_ptr<CsvLines> m_lines;
 };
 
 }  // namespace quotas

@@ -93,8 +93,8 @@ using Outcome = ImportVerdict::Kind;
 // One line of the employer's list: its values, Null where a short line
 // has none.
 struct SourceLine {
-    QVariantList values;
-    QVariant value(int column) const { return values.value(column); }
+    QStringList values;
+    QVariant value(int column) const { return column < values.size() ? QVariant(values[column]) : QVariant(); }
 };
 
 // The run's state for the lines.
@@ -287,10 +287,9 @@ ImportSummary runImport(int month, int year, int tipo, ImportVerdicts* verdicts,
     const QVariant built = callByName(component.get(), "build");
 
     auto* set = qobject_cast<ImportRecordset*>(built.value<QObject*>());
-    if (!set || !set->rows().isOpen())
+    if (!set)
         return summary;
-    Recordset& source = set->rows();
-    if (source.eof()) {
+    if (set->lineCount() == 0) {
         summary.refusal = QStringLiteral("Não foram indicados registos para importar.");
         msgBox(summary.refusal, Buttons::Ok, Icon::Information);
         return summary;
@@ -300,8 +299,9 @@ ImportSummary runImport(int month, int year, int tipo, ImportVerdicts* verdicts,
     int noTapColumn = -1;
     int quotaColumn = -1;
     int rend1Column = -1;
-    for (int i = 0; i < source.fieldCount(); ++i) {
-        const QString name = source.fieldName(i);
+    const int columns = int(set->columns().size());
+    for (int i = 0; i < columns; ++i) {
+        const QString& name = set->columns()[i];
         if (name == QLatin1String("no_tap") && noTapColumn < 0)
             noTapColumn = i;
         else if (name == QLatin1String("quota") && quotaColumn < 0)
@@ -315,10 +315,8 @@ ImportSummary runImport(int month, int year, int tipo, ImportVerdicts* verdicts,
         return summary;
     }
 
-    source.moveLast();
-    source.moveFirst();
     Progress progress;
-    progress.call("Iniciar", {source.recordCount(), QStringLiteral("Transferindo dados, aguarde uns momentos . . .")});
+    progress.call("Iniciar", {int(set->lineCount()), QStringLiteral("Transferindo dados, aguarde uns momentos . . .")});
 
     Connection& connection = Data().SqlServer;
     MonthDues dues(connection, month, year, tipo);
@@ -346,7 +344,6 @@ ImportSummary runImport(int month, int year, int tipo, ImportVerdicts* verdicts,
         std::unordered_map<qint64, double> simulated;
         if (dryRun)
             lines.simulated = &simulated;
-        const int columns = source.fieldCount();
         // Every later line would fail too: the run stops at the line it
         // was at, and says so, rather than reject the rest of the file.
         // lines: the data lines gone through, the one it stopped at included.
@@ -364,20 +361,19 @@ ImportSummary runImport(int month, int year, int tipo, ImportVerdicts* verdicts,
         };
         LazyCommits lazy(connection);
         std::vector<SourceLine> chunk;
-        while (!source.eof()) {
+        for (bool more = true; more;) {
             // A chunk of lines, and the dues they name in one read.
             chunk.clear();
             QSet<QString> staffNumbers;
-            for (; !source.eof() && chunk.size() < kChunkLines; source.moveNext()) {
-                SourceLine line;
-                for (int i = 0; i < columns; ++i)
-                    line.values << source.value(i);
-                if (!line.value(0).isNull())
-                    staffNumbers << line.value(0).toString();
-                chunk.push_back(std::move(line));
-            }
             try {
-                dues.read(staffNumbers.values());
+                SourceLine line;
+                while (chunk.size() < kChunkLines && (more = set->next(line.values))) {
+                    if (!line.value(0).isNull())
+                        staffNumbers << line.values[0];
+                    chunk.push_back(line);
+                }
+                if (!chunk.empty())
+                    dues.read(staffNumbers.values());
             } catch (const QuotasError& e) {
                 throw stopped(e, summary.lines + 1);
             }

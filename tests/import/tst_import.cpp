@@ -182,6 +182,15 @@ private slots:
             << QByteArray("a;b\n1;2\n1;2;3\n")
             << invalid + "a linha 3 tem 3 valores, mais do que os 2 nomes de colunas da primeira linha.";
         QTest::newRow("not text") << QByteArray("PK\x03\x04\0\0", 6) << "não é um ficheiro de texto CSV.";
+        // Read a block at a time: what decides the encoding, or refuses the file, may come late.
+        const QByteArray lines = "a;b\n" + QByteArray("1;2\n").repeated(30000);
+        const QString read = "a|b" + QString("/1|2").repeated(30000) + "/João|€";
+        QTest::newRow("Windows-1252 known at the end") << lines + "Jo\xE3o;\x80\n"
+                                                       << read;
+        QString utf16 = QString::fromLatin1(lines) + "João;€\n";
+        utf16.prepend(QChar::ByteOrderMark);
+        QTest::newRow("UTF-16 in many blocks") << QByteArray(reinterpret_cast<const char*>(utf16.utf16()), utf16.size() * 2) << read;
+        QTest::newRow("not text at the end") << lines + QByteArray("\0", 1) << "não é um ficheiro de texto CSV.";
     }
     void readsTheFilesOfTheOffice()
     {

@@ -199,37 +199,36 @@ struct Lines {
     }
 };
 
-void copyToRejects(Recordset& rejects, const SourceLine& line, int columns, const QString& reason)
-{
-    rejects.addNew();
-    rejects.setValue(kRejectColumns, reason);
-    const int n = std::min(columns, kRejectColumns);
-    for (int i = 0; i < n; ++i) {
-        const QVariant value = line.value(i);
-        if (!value.isNull())  // a value without text form leaves its column empty
-            rejects.setValue(i, value.toString());
-    }
-    rejects.update();
-}
+// A rejected line: its first values (a short line's missing ones left
+// out) and why it was rejected.
+struct Reject {
+    QStringList values;
+    QString reason;
+};
 
 // extras holds the rejects of the last run that had any: all of them or,
 // when the rewrite fails, still those of the run before.
-void rewriteExtras(Connection& connection, Recordset& rejects)
+void rewriteExtras(Connection& connection, const std::vector<Reject>& rejects)
 {
     Transaction tx(connection);
     connection.execute(QStringLiteral("DELETE FROM extras"));
-    Recordset extras;
-    extras.open(QStringLiteral("Select * from extras where 1 = 0"), connection, Cursor::Dynamic, Lock::Optimistic);
-    const int columns = extras.fieldCount();
-    for (rejects.moveFirst(); !rejects.eof(); rejects.moveNext()) {
-        extras.addNew();
-        for (int c = 1; c < columns && c - 1 < kRejectColumns; ++c) {
-            const QVariant value = rejects.value(c - 1);
-            if (!value.isNull())
-                extras.setValue(c, value);
-        }
-        extras.update();
+    // The host's shape: its key, then the values by position.
+    QStringList columns;
+    {
+        Recordset extras;
+        extras.open(QStringLiteral("Select * from extras where 1 = 0"), connection, Cursor::Static, Lock::ReadOnly);
+        for (int c = 1; c < extras.fieldCount() && c - 1 < kRejectColumns; ++c)
+            columns << extras.fieldName(c);
     }
+    size_t next = 0;
+    connection.appendRows(QStringLiteral("extras"), columns, [&](QVariantList& row) {
+        if (next == rejects.size())
+            return false;
+        const QStringList& values = rejects[next++].values;
+        for (qsizetype c = 0; c < columns.size(); ++c)
+            row << (c < values.size() ? QVariant(values[c]) : QVariant());
+        return true;
+    });
     tx.commit();
 }
 
@@ -249,14 +248,6 @@ void showListing()
         throw;
     }
     prints.close();
-}
-
-QStringList rejectColumns()
-{
-    QStringList names;
-    for (int i = 0; i < kRejectColumns; ++i)
-        names << QStringLiteral("Field%1").arg(i);
-    return names << QStringLiteral("Motivo");  // beside the values, not written to extras
 }
 
 }  // namespace
@@ -331,8 +322,7 @@ ImportSummary runImport(int month, int year, int tipo, ImportVerdicts* verdicts,
         return summary;
     }
 
-    Recordset rejects;
-    rejects.openInMemory(rejectColumns());
+    std::vector<Reject> rejects;
     if (!charged) {
         // Nothing to post against: the month was never generated. The
         // progress window goes first, so that the message is not behind it.
@@ -400,7 +390,7 @@ ImportSummary runImport(int month, int year, int tipo, ImportVerdicts* verdicts,
                 if (outcome == Outcome::Post)
                     ++summary.posted;
                 else if (outcome == Outcome::Reject && !dryRun)
-                    copyToRejects(rejects, line, columns, lines.verdict.reason);
+                    rejects.push_back({line.values.mid(0, kRejectColumns), lines.verdict.reason});
                 progress.call("setvalor", {1});
             }
         }
@@ -414,7 +404,7 @@ ImportSummary runImport(int month, int year, int tipo, ImportVerdicts* verdicts,
         summary.rejected = verdicts ? verdicts->count(Outcome::Reject) : 0;
         return summary;
     }
-    summary.rejected = rejects.recordCount();
+    summary.rejected = int(rejects.size());
     if (summary.rejected == 0)
         return summary;
     msgBox(QStringLiteral("Durante o processo de importação de dados não foram registados %1 associados.")
@@ -423,8 +413,8 @@ ImportSummary runImport(int month, int year, int tipo, ImportVerdicts* verdicts,
     try {
         rewriteExtras(connection, rejects);
         shared().rejectReasons.clear();
-        for (rejects.moveFirst(); !rejects.eof(); rejects.moveNext())
-            shared().rejectReasons << rejects.value(kRejectColumns).toString();
+        for (const Reject& reject : rejects)
+            shared().rejectReasons << reject.reason;
     } catch (const QuotasError& e) {
         summary.extrasSaved = false;
         msgBox(QStringLiteral("Não foi possível gravar os registos não importados na tabela extras, que ficou como "

@@ -77,17 +77,33 @@ void MonthDues::read(const QStringList& staffNumbers)
         QStringList marks;
         for (int i = 0; i < kStaffNumbers; ++i)
             marks << QStringLiteral("(?)");
-        // Led by the staff numbers, so that whatever plan the server keeps for
-        // the statement looks each one up by index. The first due by key of a
-        // staff number, and the member's first account by key, as a search of
-        // the month's dues and of the accounts in their order would find them.
-        Recordset rows;
-        rows.open(QStringLiteral("SELECT s.no_tap, m.quota_id, m.quota, m.pago, m.rend1, m.rend2, a.%1 FROM (VALUES %2) k "
+        // The first due by key of a staff number, and the member's first
+        // account by key, as a search of the month's dues and of the accounts
+        // in their order would find them. Each staff number is looked up by
+        // index, whatever the server believes of the tables: the month just
+        // generated is not yet in its statistics, and a plan that starts from
+        // the month's dues reads them all for every chunk. PostgreSQL keeps
+        // to that order only through LATERAL subqueries that OFFSET 0 keeps
+        // apart; SQLite does by itself.
+        const QString accountColumns =
+            QString(kAccountColumns).replace(QStringLiteral(", "), QStringLiteral(", a.")).arg(m_dueColumn, m_rateColumn);
+        const QString sql =
+            m_connection.engine() == Engine::PostgreSQL
+                ? QStringLiteral(
+                      "SELECT s.no_tap, m.quota_id, m.quota, m.pago, m.rend1, m.rend2, a.%1 FROM (VALUES %2) k "
+                      "CROSS JOIN LATERAL (SELECT socio_id, no_tap FROM tbSocios WHERE no_tap = k.column1 OFFSET 0) s "
+                      "CROSS JOIN LATERAL (SELECT quota_id, socio_id, quota, pago, rend1, rend2 FROM tbQuotas_Movimentos "
+                      "WHERE socio_id = s.socio_id AND ano = ? AND mes = ? AND tipo = ? OFFSET 0) m "
+                      "LEFT OUTER JOIN LATERAL (SELECT %3 FROM tbQuotas_Socios WHERE socio_id = m.socio_id OFFSET 0) a "
+                      "ON TRUE ORDER BY m.quota_id, a.squota_id")
+                      .arg(accountColumns, marks.join(u','), QString(kAccountColumns).arg(m_dueColumn, m_rateColumn))
+                : QStringLiteral("SELECT s.no_tap, m.quota_id, m.quota, m.pago, m.rend1, m.rend2, a.%1 FROM (VALUES %2) k "
                                  "JOIN tbSocios s ON s.no_tap = k.column1 JOIN tbQuotas_Movimentos m ON m.socio_id = "
                                  "s.socio_id LEFT OUTER JOIN tbQuotas_Socios a ON a.socio_id = m.socio_id WHERE m.ano = ? "
                                  "AND m.mes = ? AND m.tipo = ? ORDER BY m.quota_id, a.squota_id")
-                      .arg(QString(kAccountColumns).replace(QStringLiteral(", "), QStringLiteral(", a.")).arg(m_dueColumn, m_rateColumn),
-                           marks.join(u',')),
+                      .arg(accountColumns, marks.join(u','));
+        Recordset rows;
+        rows.open(sql,
                   m_connection, Cursor::ForwardOnly, Lock::ReadOnly, params);
         QVariant lastDue;
         for (; !rows.eof(); rows.moveNext()) {

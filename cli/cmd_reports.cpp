@@ -12,7 +12,7 @@ namespace {
 QString pdfPath(const QString& command, const QStringList& args)
 {
     const Options options(command, args);
-    const QString path = options.value(QStringLiteral("pdf"));
+    QString path = options.value(QStringLiteral("pdf"));
     if (path.isEmpty())
         throw UsageError(QStringLiteral("%1: falta --pdf SAIDA.").arg(command));
     return path;

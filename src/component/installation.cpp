@@ -27,7 +27,7 @@ QString installedDataDir()
 
 QString installationDataDir()
 {
-    const QString fromEnvironment = qEnvironmentVariable("QUOTAS_DATA_DIR");
+    QString fromEnvironment = qEnvironmentVariable("QUOTAS_DATA_DIR");
     if (!fromEnvironment.isEmpty())
         return fromEnvironment;
     // An installed library never reaches back into the tree it was built from.

@@ -3,6 +3,7 @@
 #include "component/money.h"
 #include "component/month_names.h"
 #include "generation/dues_account.h"
+#include "generation/generation_outcome.h"
 #include "platform/connection.h"
 #include "platform/transaction.h"
 
@@ -70,11 +71,6 @@ QString typeName(int tipo)
                                                                : QStringLiteral("Tipo %1").arg(tipo);
 }
 
-QString dues(int n)
-{
-    return n == 1 ? QStringLiteral("1 quota") : QStringLiteral("%1 quotas").arg(n);
-}
-
 // "Sindicato: 2 quotas, € 30,00" per type, and the whole.
 QStringList totalsByType(const QList<UndoDue>& list)
 {
@@ -88,8 +84,8 @@ QStringList totalsByType(const QList<UndoDue>& list)
     }
     QStringList lines;
     for (const auto& [tipo, t] : byType)
-        lines << QStringLiteral("  %1: %2, %3").arg(typeName(tipo), dues(t.first), money(t.second));
-    lines.prepend(QStringLiteral("%1, %2").arg(dues(int(list.size())), money(all)));
+        lines << QStringLiteral("  %1: %2, %3").arg(typeName(tipo), duesCount(t.first), money(t.second));
+    lines.prepend(QStringLiteral("%1, %2").arg(duesCount(int(list.size())), money(all)));
     return lines;
 }
 
@@ -141,15 +137,15 @@ QString UndoPlan::confirmation() const
 {
     return QStringLiteral("Eliminar %1 de %2, no valor de %3? As contas dos associados descontam este valor; os "
                           "números das quotas não voltam a ser usados.")
-        .arg(dues(int(removed.size())), monthOf(choice), money(sum(removed)));
+        .arg(duesCount(int(removed.size())), monthOf(choice), money(sum(removed)));
 }
 
 QString UndoOutcome::summary(const UndoChoice& choice) const
 {
     QString text = QStringLiteral("Anulação concluída: %1 de %2 eliminadas, no valor de %3.")
-                       .arg(dues(removed), monthOf(choice), money(amount));
+                       .arg(duesCount(removed), monthOf(choice), money(amount));
     if (changedMeanwhile > 0)
-        text += QStringLiteral(" %1 entretanto paga(s) ou alterada(s): ficaram.").arg(dues(changedMeanwhile));
+        text += QStringLiteral(" %1 entretanto paga(s) ou alterada(s): ficaram.").arg(duesCount(changedMeanwhile));
     return text;
 }
 

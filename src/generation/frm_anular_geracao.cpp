@@ -21,14 +21,14 @@ namespace quotas {
 
 namespace {
 
-const QString kCaption = QStringLiteral("Anular Geração");
+const QString kUndoCaption = QStringLiteral("Anular Geração");
 
 }  // namespace
 
 frmAnularGeracao::frmAnularGeracao(QDate today, QWidget* parent) : QDialog(parent)
 {
     setObjectName(QStringLiteral("frmAnularGeracao"));
-    setWindowTitle(kCaption);
+    setWindowTitle(kUndoCaption);
     setModal(true);
     Ano = new QSpinBox(this);
     Ano->setRange(1999, today.year() + 1);
@@ -81,7 +81,7 @@ bool frmAnularGeracao::readChoice(UndoChoice& choice)
         return true;
     const std::optional<StaffMember> member = findMemberByStaffNumber(Data().SqlServer, No_Tap->text());
     if (!member) {
-        msgBox(QStringLiteral("Número de Empresa não existe!"), Buttons::Ok, Icon::Information, kCaption);
+        msgBox(QStringLiteral("Número de Empresa não existe!"), Buttons::Ok, Icon::Information, kUndoCaption);
         No_Tap->setFocus(Qt::OtherFocusReason);
         return false;
     }
@@ -98,7 +98,7 @@ bool frmAnularGeracao::showPlan()
         Plano->setPlainText(planUndo(Data().SqlServer, choice).text());
         return true;
     } catch (const QuotasError& e) {
-        msgBox(e.message(), Buttons::Ok, Icon::Critical, kCaption);
+        msgBox(e.message(), Buttons::Ok, Icon::Critical, kUndoCaption);
         return false;
     }
 }
@@ -113,17 +113,17 @@ void frmAnularGeracao::undo()
         const UndoPlan plan = planUndo(Data().SqlServer, choice);
         Plano->setPlainText(plan.text());
         if (plan.removed.isEmpty()) {
-            msgBox(QStringLiteral("Não há quotas a eliminar."), Buttons::Ok, Icon::Information, kCaption);
+            msgBox(QStringLiteral("Não há quotas a eliminar."), Buttons::Ok, Icon::Information, kUndoCaption);
             return;
         }
-        if (msgBox(plan.confirmation(), Buttons::YesNoDefaultNo, Icon::Question, kCaption) != Answer::Yes)
+        if (msgBox(plan.confirmation(), Buttons::YesNoDefaultNo, Icon::Question, kUndoCaption) != Answer::Yes)
             return;
         const UndoOutcome outcome = AnularGeracao(Data().SqlServer, plan);
         Plano->setPlainText(planUndo(Data().SqlServer, choice).text());
-        msgBox(outcome.summary(choice), Buttons::Ok, Icon::Information, kCaption);
+        msgBox(outcome.summary(choice), Buttons::Ok, Icon::Information, kUndoCaption);
     } catch (const QuotasError& e) {
         // Each member's removal committed or not as a whole; the plan shows where things stand.
-        msgBox(e.message(), Buttons::Ok, Icon::Critical, kCaption);
+        msgBox(e.message(), Buttons::Ok, Icon::Critical, kUndoCaption);
         showPlan();
     }
 }

@@ -15,12 +15,12 @@ QString listed(const QStringList& members)
     return text;
 }
 
-QString dues(int n)
+}  // namespace
+
+QString duesCount(int n)
 {
     return n == 1 ? QStringLiteral("1 quota") : QStringLiteral("%1 quotas").arg(n);
 }
-
-}  // namespace
 
 QString GenerationOutcome::summary() const
 {
@@ -32,15 +32,15 @@ QString GenerationOutcome::summary() const
     if (missingRemuneration > 0)
         lines << QStringLiteral("- %1 porque a conta do associado não tem a remuneração 1 ou a remuneração 2 "
                                 "(Nº Empresa: %2);")
-                     .arg(dues(missingRemuneration), listed(membersMissingRemuneration));
+                     .arg(duesCount(missingRemuneration), listed(membersMissingRemuneration));
     if (missingRate > 0)
         lines << QStringLiteral("- %1 porque a empresa do associado não tem a percentagem de quotização "
                                 "(Nº Empresa: %2);")
-                     .arg(dues(missingRate), listed(membersMissingRate));
+                     .arg(duesCount(missingRate), listed(membersMissingRate));
     if (unreadable > 0)
         lines << QStringLiteral("- %1 porque um valor guardado não é um número válido ou a data não é legível "
                                 "(Nº Empresa: %2);")
-                     .arg(dues(unreadable), listed(membersUnreadable));
+                     .arg(duesCount(unreadable), listed(membersUnreadable));
     lines << QStringLiteral("Corrija estes valores e volte a gerar o mesmo mês: as quotas já geradas não se repetem.");
     return lines.join(u'\n');
 }

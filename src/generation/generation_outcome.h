@@ -5,6 +5,9 @@
 
 namespace quotas {
 
+// A count of dues in words: "1 quota", "3 quotas".
+QString duesCount(int n);
+
 // What a generation run did, and the dues it could not post.
 struct GenerationOutcome {
     int members = 0;  // members visited

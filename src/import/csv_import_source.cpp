@@ -21,7 +21,7 @@ QString askWithFileDialog()
 {
     // The employer sends a file a month, usually to the same folder.
     static QString lastFolder;
-    const QString path = QFileDialog::getOpenFileName(
+    QString path = QFileDialog::getOpenFileName(
         QApplication::activeWindow(), QStringLiteral("Lista de quotas a importar"), lastFolder,
         QStringLiteral("Ficheiros CSV (*.csv *.txt);;Todos os ficheiros (*)"));
     if (!path.isEmpty())

@@ -29,7 +29,7 @@ QString decodeImportText(const QByteArray& bytes)
     }
     const QByteArray body = bytes.startsWith("\xEF\xBB\xBF") ? bytes.mid(3) : bytes;
     QStringDecoder utf8(QStringDecoder::Utf8, QStringDecoder::Flag::Stateless);
-    const QString text = utf8(body);
+    QString text = utf8(body);
     if (!utf8.hasError())
         return text;
     return fromWindows1252(body);

@@ -47,7 +47,7 @@ const TotalsPass kTotalsPasses[] = {
 
 QString keyOf(Connection& connection, const QString& table)
 {
-    const QString key = connection.primaryKey(table);
+    QString key = connection.primaryKey(table);
     if (key.isEmpty())
         throw DbError(QStringLiteral("A tabela \"%1\" não tem chave primária: não é possível gravar.").arg(table));
     return key;

@@ -23,11 +23,11 @@ Registry& registry()
 
 }  // namespace
 
-void registerComponent(const QString& progId, ComponentFactory factory)
+void registerComponent(const QString& progId, const ComponentFactory& factory)
 {
     Registry& r = registry();
     QMutexLocker lock(&r.mutex);
-    r.factories.insert(progId.toLower(), std::move(factory));
+    r.factories.insert(progId.toLower(), factory);
 }
 
 void unregisterComponent(const QString& progId)

@@ -14,7 +14,7 @@ using ComponentFactory = std::function<std::unique_ptr<QObject>()>;
 
 // Registers or replaces the factory of a ProgID (the command line replaces
 // the progress window by a console one; tests replace it by a recorder).
-void registerComponent(const QString& progId, ComponentFactory factory);
+void registerComponent(const QString& progId, const ComponentFactory& factory);
 void unregisterComponent(const QString& progId);
 
 // Throws QuotasError when nothing is registered under the ProgID.

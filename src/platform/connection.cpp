@@ -251,7 +251,7 @@ QString Connection::primaryKey(const QString& table)
     if (found != m_primaryKeys.constEnd())
         return *found;
     const QSqlIndex index = QSqlDatabase::database(m_dbName, false).primaryIndex(m_dialect->catalogName(table));
-    const QString column = index.count() == 1 ? index.fieldName(0) : QString();
+    QString column = index.count() == 1 ? index.fieldName(0) : QString();
     m_primaryKeys.insert(key, column);
     return column;
 }

@@ -444,7 +444,7 @@ void Recordset::update()
 
 QString Recordset::primaryKeyColumn(const QString& table, int* columnIndex) const
 {
-    const QString key = m_connection->primaryKey(table);
+    QString key = m_connection->primaryKey(table);
     *columnIndex = -1;
     if (key.isEmpty())
         throw DbError(QStringLiteral("A tabela \"%1\" não tem chave primária: não é possível gravar.").arg(table));

@@ -15,7 +15,7 @@ QString letterheadPath()
     // The administrator's copy in /etc/quotas is edited in place and kept by
     // upgrades; a data folder named in the environment (tests, trials) wins.
     if (qEnvironmentVariableIsEmpty("QUOTAS_DATA_DIR")) {
-        const QString edited = QStringLiteral("/etc/quotas/") + name;
+        QString edited = QStringLiteral("/etc/quotas/") + name;
         if (QFileInfo::exists(edited))
             return edited;
     }

@@ -14,7 +14,6 @@ namespace quotas {
 namespace {
 
 const QString kMoney = QStringLiteral("#,##0.00");
-const QString kMoneyEsc = QStringLiteral("#,##0.00 Esc");
 
 struct MovementTable {
     const char* name;

@@ -15,8 +15,6 @@ namespace quotas {
 
 namespace {
 
-const QString kMoneyEsc = QStringLiteral("#,##0.00 Esc");
-
 struct Attention {
     QString caption;
     int count;

@@ -49,9 +49,9 @@ void Report::showPreview(QWidget* parent)
     showReportPreview(run(), parent);
 }
 
-ReportDocument layOutObservedReport(std::shared_ptr<const ReportLayout> layout, Recordset& rows, const QDate& printed)
+ReportDocument layOutObservedReport(const std::shared_ptr<const ReportLayout>& layout, Recordset& rows, const QDate& printed)
 {
-    ReportDocument doc = layOutReport(std::move(layout), rows, printed);
+    ReportDocument doc = layOutReport(layout, rows, printed);
     if (observer())
         observer()(doc);
     return doc;

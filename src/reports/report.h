@@ -47,7 +47,7 @@ private:
 
 // Lays pages out as Report::run does, telling the observer, for reports
 // whose rows are computed rather than read from a named command.
-ReportDocument layOutObservedReport(std::shared_ptr<const ReportLayout> layout, Recordset& rows,
+ReportDocument layOutObservedReport(const std::shared_ptr<const ReportLayout>& layout, Recordset& rows,
                                     const QDate& printed = QDate::currentDate());
 
 // The modal print preview of pages already laid out.

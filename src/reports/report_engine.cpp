@@ -108,7 +108,7 @@ struct Aggregate {
 
 }  // namespace
 
-ReportDocument layOutReport(std::shared_ptr<const ReportLayout> layoutPtr, Recordset& rows, const QDate& printed)
+ReportDocument layOutReport(const std::shared_ptr<const ReportLayout>& layoutPtr, Recordset& rows, const QDate& printed)
 {
     const ReportLayout& layout = *layoutPtr;
     ReportDocument doc;

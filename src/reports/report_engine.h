@@ -20,7 +20,7 @@ class Recordset;
 // Reads every row of rows from the first; fields name its columns (a
 // missing column is a QuotasError). Count and Sum cover all rows; sums are
 // kept in whole cents. printed is the date "%D" shows.
-ReportDocument layOutReport(std::shared_ptr<const ReportLayout> layout, Recordset& rows,
+ReportDocument layOutReport(const std::shared_ptr<const ReportLayout>& layout, Recordset& rows,
                             const QDate& printed = QDate::currentDate());
 
 }  // namespace quotas

@@ -9,6 +9,9 @@ namespace quotas {
 // The reports' own fixed formats, the same on every machine whatever the
 // user's locale: a printed listing must read the same wherever it is printed.
 
+// The layouts' money format.
+inline const QString kMoneyEsc = QStringLiteral("#,##0.00 Esc");
+
 // A value as a report field prints it. Null prints nothing. A number format
 // such as "#,##0.00 Esc" groups thousands with "." and writes two decimals
 // after "," (Portuguese practice), rounded half to even, with the literal

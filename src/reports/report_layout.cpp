@@ -44,13 +44,13 @@ ReportBand reportBand(const QString& name, int height, std::vector<ReportItem> i
     return b;
 }
 
-ReportItem label(const QString& name, const QString& caption, int left, int top, int width, int height, ReportFont font,
+ReportItem label(const QString& name, const QString& caption, int left, int top, int width, int height, const ReportFont& font,
                  Align align)
 {
     return item(ItemKind::Label, name, caption, left, top, width, height, font, align);
 }
 
-ReportItem field(const QString& name, const QString& column, int left, int top, int width, int height, ReportFont font,
+ReportItem field(const QString& name, const QString& column, int left, int top, int width, int height, const ReportFont& font,
                  Align align, const QString& format)
 {
     ReportItem i = item(ItemKind::Field, name, column, left, top, width, height, font, align);
@@ -74,13 +74,13 @@ ReportItem box(const QString& name, int left, int top, int width, int height, QC
 }
 
 ReportItem countOf(const QString& name, const QString& column, int left, int top, int width, int height,
-                   ReportFont font, Align align)
+                   const ReportFont& font, Align align)
 {
     return item(ItemKind::Count, name, column, left, top, width, height, font, align);
 }
 
 ReportItem sumOf(const QString& name, const QString& column, const QString& format, int left, int top, int width,
-                 int height, ReportFont font, Align align)
+                 int height, const ReportFont& font, Align align)
 {
     ReportItem i = item(ItemKind::Sum, name, column, left, top, width, height, font, align);
     i.format = format;

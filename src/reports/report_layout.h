@@ -99,15 +99,15 @@ struct PaperSetup {
 // Shorthands that keep the layouts readable as tables.
 ReportBand reportBand(const QString& name, int height, std::vector<ReportItem> items = {}, bool pageBreakAfter = false);
 ReportItem label(const QString& name, const QString& caption, int left, int top, int width, int height,
-                 ReportFont font = {}, Align align = Align::Left);
+                 const ReportFont& font = {}, Align align = Align::Left);
 ReportItem field(const QString& name, const QString& column, int left, int top, int width, int height,
-                 ReportFont font = {}, Align align = Align::Left, const QString& format = QString());
+                 const ReportFont& font = {}, Align align = Align::Left, const QString& format = QString());
 ReportItem hline(const QString& name, int left, int top, int width, QColor color = QColor(128, 128, 128));
 ReportItem box(const QString& name, int left, int top, int width, int height, QColor fill, QColor border);
 ReportItem countOf(const QString& name, const QString& column, int left, int top, int width, int height,
-                   ReportFont font = {}, Align align = Align::Left);
+                   const ReportFont& font = {}, Align align = Align::Left);
 ReportItem sumOf(const QString& name, const QString& column, const QString& format, int left, int top, int width,
-                 int height, ReportFont font = {}, Align align = Align::Left);
+                 int height, const ReportFont& font = {}, Align align = Align::Left);
 
 // The page footer of the listings: a rule, "Processado por Computador" and
 // "Página: n / total".

@@ -85,7 +85,7 @@ QString decodeFile(const QByteArray& bytes, RegistryFile::Encoding& encoding)
     const bool mark = bytes.startsWith("\xEF\xBB\xBF");
     const QByteArray body = mark ? bytes.mid(3) : bytes;
     auto utf8 = QStringDecoder(QStringDecoder::Utf8, QStringDecoder::Flag::Stateless | QStringDecoder::Flag::ConvertInitialBom);
-    const QString text = utf8(body);
+    QString text = utf8(body);
     if (!utf8.hasError()) {
         encoding = mark ? Encoding::Utf8Bom : Encoding::Utf8;
         return text;
@@ -111,7 +111,7 @@ QByteArray encodeFile(const QString& text, RegistryFile::Encoding encoding)
         // Once a line with the byte that made the file ANSI is gone, what is
         // left may also be valid UTF-8 and would be read back as such, every
         // accented letter changed; with the UTF-8 mark it reads back as it was.
-        const QByteArray ansi = toCodePage1252(text);
+        QByteArray ansi = toCodePage1252(text);
         const bool ascii = std::all_of(ansi.begin(), ansi.end(), [](char c) { return uchar(c) < 0x80; });
         if (ascii || !QByteArrayView(ansi).isValidUtf8())
             return ansi;

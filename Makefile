@@ -1,6 +1,7 @@
 # The two commands of a fresh Debian 12 machine: `make run` and `make test`.
-# `make check` adds what CI runs beside the tests: the layout check and the
-# sanitizer build with the fuzz targets. `make check-tidy` runs clang-tidy. `make package` builds the Debian package of an
+# `make check` adds what CI runs beside the tests: the layout check, clang-tidy
+# (after `make test`, which makes the compile commands) and the sanitizer build
+# with the fuzz targets. `make package` builds the Debian package of an
 # installation.
 .PHONY: build run test check check-sanitize check-tidy check-format bench package clean
 
@@ -13,7 +14,7 @@ run:
 test:
 	scripts/test.sh
 
-check: check-format check-sanitize
+check: check-format check-tidy check-sanitize
 
 check-sanitize:
 	scripts/check-sanitize.sh

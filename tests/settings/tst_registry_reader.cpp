@@ -19,6 +19,7 @@
 
 using namespace quotas;
 using namespace quotas::registry;
+using namespace Qt::StringLiterals;
 using quotas::test::ScriptedBoxes;
 
 namespace {
@@ -40,10 +41,8 @@ class RegistryReaderTest : public QObject {
     QString writeFile(const QByteArray& bytes, const QString& name = QStringLiteral("settings.reg"))
     {
         const QString path = dir.filePath(name);
-        QFile f(path);
-        f.open(QIODevice::WriteOnly | QIODevice::Truncate);
-        f.write(bytes);
-        f.close();
+        if (QFile f(path); f.open(QIODevice::WriteOnly | QIODevice::Truncate))
+            f.write(bytes);
         setRegistryPath(path);
         return path;
     }
@@ -78,12 +77,9 @@ private slots:
         QCOMPARE(found, root);
         QCOMPARE(rewritten, subKey);
         QCOMPARE(boxes.shown.size(), malformed ? 1 : 0);
-        if (malformed) {
-            QCOMPARE(boxes.last().text, QStringLiteral("Formato Incorrecto:\n\n") + path);
-            QCOMPARE(boxes.last().icon, Icon::None);
-            QCOMPARE(boxes.last().buttons, Buttons::Ok);
-            QCOMPARE(boxes.last().title, applicationTitle());
-        }
+        if (malformed)
+            QVERIFY(boxes.last().text == QStringLiteral("Formato Incorrecto:\n\n") + path && boxes.last().icon == Icon::None
+                    && boxes.last().buttons == Buttons::Ok && boxes.last().title == applicationTitle());
     }
 
     void values_data()
@@ -177,15 +173,9 @@ private slots:
         QTest::addColumn<QString>("header");
         QTest::addColumn<QString>("encoding");  // UTF-16LE, UTF-8 or Windows-1252
         QTest::addColumn<QString>("end");
-        QTest::newRow("registry editor: UTF-16, CRLF") << "Windows Registry Editor Version 5.00"
-                                                       << "UTF-16LE"
-                                                       << "\r\n";
-        QTest::newRow("UTF-8, LF") << "Windows Registry Editor Version 5.00"
-                                   << "UTF-8"
-                                   << "\n";
-        QTest::newRow("REGEDIT4, ANSI, CRLF") << "REGEDIT4"
-                                              << "Windows-1252"
-                                              << "\r\n";
+        QTest::newRow("registry editor: UTF-16, CRLF") << u"Windows Registry Editor Version 5.00"_s << u"UTF-16LE"_s << u"\r\n"_s;
+        QTest::newRow("UTF-8, LF") << u"Windows Registry Editor Version 5.00"_s << u"UTF-8"_s << u"\n"_s;
+        QTest::newRow("REGEDIT4, ANSI, CRLF") << u"REGEDIT4"_s << u"Windows-1252"_s << u"\r\n"_s;
     }
     void writingKeepsTheFileAsItWasAndHidesIt()
     {

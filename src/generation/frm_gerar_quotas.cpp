@@ -1,6 +1,6 @@
 #include "generation/frm_gerar_quotas.h"
 #include "platform/dialog_layout.h"
-#include "component/month_names.h"
+#include "component/year_month_lists.h"
 
 #include "component/shared_objects.h"
 #include "generation/member_lookup.h"
@@ -68,16 +68,7 @@ frmGerarQuotas::frmGerarQuotas(QDate today, QWidget* parent) : QDialog(parent)
 
 void frmGerarQuotas::load(QDate today)
 {
-    List1->clear();
-    for (int year = 1999; year <= today.year() + 1; ++year)
-        List1->addItem(QString::number(year));
-    const auto years = List1->findItems(QString::number(today.year()), Qt::MatchExactly);
-    if (!years.isEmpty())
-        List1->setCurrentItem(years.front());
-
-    List2->clear();
-    List2->addItems(monthNames());
-    List2->setCurrentRow(today.month() - 1);
+    fillYearAndMonthLists(List1, List2, today);
 
     No_Tap->clear();
     Text2->clear();

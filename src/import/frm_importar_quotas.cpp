@@ -1,6 +1,7 @@
 #include "import/frm_importar_quotas.h"
 #include "platform/dialog_layout.h"
 #include "component/month_names.h"
+#include "component/year_month_lists.h"
 
 #include "component/shared_objects.h"
 #include "import/dry_run_window.h"
@@ -93,14 +94,7 @@ FrmImportarQuotas::FrmImportarQuotas(QWidget* owner, Mode mode)
     shared().SemSeparadorDecimal = false;
     connect(Check1, &QCheckBox::toggled, this, [](bool checked) { shared().SemSeparadorDecimal = !checked; });
 
-    const QDate now = today();
-    for (int year = 1999; year <= now.year() + 1; ++year)
-        List1->addItem(QString::number(year));
-    const auto years = List1->findItems(QString::number(now.year()), Qt::MatchExactly);
-    if (!years.isEmpty())
-        List1->setCurrentItem(years.front());
-    List2->addItems(monthNames());
-    List2->setCurrentRow(now.month() - 1);
+    fillYearAndMonthLists(List1, List2, today());
     List3->addItems({QStringLiteral("Sindicato"), QStringLiteral("Plano de Saúde")});
     List3->setCurrentRow(0);
     for (QListWidget* list : {List1, List2, List3}) {

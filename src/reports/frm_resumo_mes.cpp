@@ -1,6 +1,6 @@
 #include "reports/frm_resumo_mes.h"
 
-#include "component/month_names.h"
+#include "component/year_month_lists.h"
 #include "platform/dialog_layout.h"
 #include "platform/errors.h"
 #include "platform/message_boxes.h"
@@ -42,11 +42,7 @@ frmResumoMes::frmResumoMes(QDate today, QWidget* parent) : QDialog(parent)
     sair->setObjectName(QStringLiteral("Command2"));
     sair->setGeometry(twips(4920, 900, 1695, 375));
 
-    for (int year = 1999; year <= today.year() + 1; ++year)
-        List1->addItem(QString::number(year));
-    List1->setCurrentRow(today.year() - 1999);
-    List2->addItems(monthNames());
-    List2->setCurrentRow(today.month() - 1);
+    fillYearAndMonthLists(List1, List2, today);
     connect(mostrar, &QPushButton::clicked, this, &frmResumoMes::showSummary);
     connect(sair, &QPushButton::clicked, this, &QDialog::accept);
 }

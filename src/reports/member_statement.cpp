@@ -24,11 +24,6 @@ constexpr MovementTable kTables[] = {{"tbQuotas_Movimentos", ""},
                                      {"tbQuotas_Movimentos_Inactivos", "Inactivo"},
                                      {"tbQuotas_Movimentos_Historico", "Histórico"}};
 
-QString money(qint64 cents, const QString& format = kMoney)
-{
-    return formatReportValue(double(cents) / 100.0, format);
-}
-
 QString period(int yearMonth)
 {
     return QStringLiteral("%1/%2").arg(yearMonth % 100, 2, 10, QLatin1Char('0')).arg(yearMonth / 100);
@@ -231,11 +226,11 @@ ReportDocument layOutMemberStatement(const MemberStatement& s, const Letterhead&
     std::vector<ReportItem> totals = {
         hline(QStringLiteral("linTotais"), 75, 15, 10500),
         label(QStringLiteral("lblTotalQuotas"), QStringLiteral("Total de quotas:"), 5505, 120, 2310, 240, bold),
-        label(QStringLiteral("txtTotalQuotas"), money(s.charged, kMoneyEsc), 7845, 120, 1800, 240, arial(), Align::Right),
+        label(QStringLiteral("txtTotalQuotas"), formatCents(s.charged, kMoneyEsc), 7845, 120, 1800, 240, arial(), Align::Right),
         label(QStringLiteral("lblTotalPago"), QStringLiteral("Total pago:"), 5505, 390, 2310, 240, bold),
-        label(QStringLiteral("txtTotalPago"), money(s.paid, kMoneyEsc), 7845, 390, 1800, 240, arial(), Align::Right),
+        label(QStringLiteral("txtTotalPago"), formatCents(s.paid, kMoneyEsc), 7845, 390, 1800, 240, arial(), Align::Right),
         label(QStringLiteral("lblTotalAberto"), QStringLiteral("Total em aberto:"), 5505, 660, 2310, 240, bold),
-        label(QStringLiteral("txtTotalAberto"), money(s.open(), kMoneyEsc), 7845, 660, 1800, 240, arial(), Align::Right),
+        label(QStringLiteral("txtTotalAberto"), formatCents(s.open(), kMoneyEsc), 7845, 660, 1800, 240, arial(), Align::Right),
     };
     int footer = 960;
     if (s.unreadable > 0) {
@@ -249,9 +244,9 @@ ReportDocument layOutMemberStatement(const MemberStatement& s, const Letterhead&
         const QString stored =
             s.hasAccount ? QStringLiteral("Na conta: %1 de quotas, %2 pagos; ")
                                .arg(s.storedCharged.unreadable() ? s.storedCharged.text
-                                                                 : money(s.storedCharged.centsOrZero(), kMoneyEsc),
+                                                                 : formatCents(s.storedCharged.centsOrZero(), kMoneyEsc),
                                     s.storedPaid.unreadable() ? s.storedPaid.text
-                                                              : money(s.storedPaid.centsOrZero(), kMoneyEsc))
+                                                              : formatCents(s.storedPaid.centsOrZero(), kMoneyEsc))
                          : QStringLiteral("O associado não tem conta de quotas; ");
         totals.push_back(label(QStringLiteral("lblAcumulados"),
                                stored + QStringLiteral("os acumulados da conta diferem: corra a Manutenção de Dados."), 120,

@@ -86,11 +86,6 @@ QString dotted(qint64 cents)
     return QString::number(double(cents) / 100.0, 'f', 2);
 }
 
-QString plainAmount(qint64 cents)
-{
-    return formatReportValue(double(cents) / 100.0, QStringLiteral("0.00"));
-}
-
 }  // namespace
 
 MonthTypeFigures& MonthTypeFigures::operator+=(const MonthTypeFigures& o)
@@ -213,10 +208,10 @@ ReportDocument layOutMonthSummary(const MonthSummary& s, const QDate& printed)
     const QStringList totals = {QStringLiteral("Total"),
                                 QString::number(t.members),
                                 QString::number(t.dues),
-                                formatReportValue(double(t.charged) / 100.0, kMoneyEsc),
-                                formatReportValue(double(t.deducted) / 100.0, kMoneyEsc),
-                                formatReportValue(double(t.paidOtherwise) / 100.0, kMoneyEsc),
-                                formatReportValue(double(t.open) / 100.0, kMoneyEsc)};
+                                formatCents(t.charged, kMoneyEsc),
+                                formatCents(t.deducted, kMoneyEsc),
+                                formatCents(t.paidOtherwise, kMoneyEsc),
+                                formatCents(t.open, kMoneyEsc)};
     for (size_t i = 0; i < columns.size(); ++i)
         footer.push_back(label(QStringLiteral("tot") + QLatin1String(columns[i].name), totals[qsizetype(i)], columns[i].left,
                                75, columns[i].width, 240, bold, i == 0 ? Align::Left : Align::Right));
@@ -261,10 +256,10 @@ QByteArray monthSummaryCsv(const MonthSummary& s)
         lines << QStringList{f.ref,
                              QString::number(f.members),
                              QString::number(f.dues),
-                             plainAmount(f.charged),
-                             plainAmount(f.deducted),
-                             plainAmount(f.paidOtherwise),
-                             plainAmount(f.open)}
+                             formatCents(f.charged, QStringLiteral("0.00")),
+                             formatCents(f.deducted, QStringLiteral("0.00")),
+                             formatCents(f.paidOtherwise, QStringLiteral("0.00")),
+                             formatCents(f.open, QStringLiteral("0.00"))}
                      .join(u';');
     lines << QString();
     for (const Attention& a : attentionOf(s))

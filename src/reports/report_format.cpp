@@ -154,6 +154,11 @@ QString formatReportValue(const QVariant& value, const QString& format)
     return value.toString();
 }
 
+QString formatCents(qint64 cents, const QString& format)
+{
+    return formatReportValue(double(cents) / 100.0, format);
+}
+
 QString longPortugueseDate(const QDate& date)
 {
     static const QLocale portuguese(QLocale::Portuguese, QLocale::Portugal);

@@ -20,6 +20,9 @@ inline const QString kMoneyEsc = QStringLiteral("#,##0.00 Esc");
 // as a number is formatted as one; other text prints as it stands.
 QString formatReportValue(const QVariant& value, const QString& format = QString());
 
+// An amount in cents, printed as formatReportValue prints its value in euros.
+QString formatCents(qint64 cents, const QString& format);
+
 // "%D": the long Portuguese date of a letter's heading, "6 de dezembro de
 // 2026" (day without a leading zero, month in lower case, no weekday).
 QString longPortugueseDate(const QDate& date);

@@ -36,7 +36,7 @@ struct StatementCase {
 
 QString cents(qint64 c)
 {
-    return formatReportValue(double(c) / 100.0, u"0.00"_s);
+    return formatCents(c, u"0.00"_s);
 }
 
 }  // namespace

@@ -43,15 +43,6 @@ QStringList told(const ScriptedBoxes& boxes)
     return out;
 }
 
-// The items of a list, the current one in brackets.
-QStringList items(const QListWidget* list)
-{
-    QStringList out;
-    for (int i = 0; i < list->count(); ++i)
-        out << (i == list->currentRow() ? "[" + list->item(i)->text() + "]" : list->item(i)->text());
-    return out;
-}
-
 void pick(QListWidget* list, int row)
 {
     list->scrollToItem(list->item(row));
@@ -324,14 +315,6 @@ private slots:
                           "SUM(m.quota) FROM tbQuotas_Movimentos m WHERE m.socio_id = a.socio_id)) > 0.005) FROM tbQuotas_Movimentos"),
                      QStringList{QStringLiteral("%1|%1|%1|%1|%1|%2|0").arg(mes * (kMembers + insured)).arg(kMembers)});
         }
-    }
-
-    void dialogListsAndPreselectionForJanuary2003()
-    {
-        frmGerarQuotas& d = open();
-        QCOMPARE(items(d.List1), QStringList({"1999", "2000", "2001", "2002", "[2003]", "2004"}));
-        QCOMPARE(items(d.List2), QStringList({"[Janeiro]", "Fevereiro", "Março", "Abril", "Maio", "Junho", "Julho", "Agosto",
-                                              "Setembro", "Outubro", "Novembro", "Dezembro"}));
     }
 
     // Member 2's account has no remuneration 2: the dues not generated are

@@ -1,11 +1,13 @@
 // The dues import on both engines: the CSV reader, ProcessarImportacao on
-// members charged for March 2004, "quotas importar" as a process, and the
-// dialog frmImportarQuotas driven as a user would.
+// members charged for March 2004, its dry run, "quotas importar" (and
+// "--simular") as a process, and the dialog frmImportarQuotas driven as a
+// user would.
 
 #include "component/general.h"
 #include "component/shared_objects.h"
 #include "import/csv_reader.h"
 #include "import/frm_importar_quotas.h"
+#include "import/import_verdict.h"
 #include "import/processar_importacao.h"
 #include "import/csv_import_source.h"
 #include "platform/components.h"
@@ -21,6 +23,7 @@
 
 using namespace quotas;
 using namespace quotas::test;
+using namespace Qt::StringLiterals;
 
 namespace {
 
@@ -56,6 +59,20 @@ void pick(const char* name, const QString& text)
 void click(const char* name)
 {
     QTest::mouseClick(shared().frmImportarQuotas->findChild<QAbstractButton*>(QLatin1String(name)), Qt::LeftButton);
+}
+
+// Each line's verdict as "line|no_tap|verdict|quota before|pago before|quota after|pago after|reason".
+QStringList described(const ImportVerdicts& verdicts)
+{
+    QStringList out;
+    const auto amount = [](qint64 cents) { return QString::number(double(cents) / 100.0, 'f', 2); };
+    for (const ImportVerdict& v : verdicts.lines) {
+        const bool posted = v.kind == ImportVerdict::Kind::Post;
+        out << u"%1|%2|%3|%4|%5|%6"_s.arg(v.line).arg(v.noTap, v.kindText(),
+                                                      v.matched ? amount(v.quotaBefore) + u'|' + amount(v.pagoBefore) : u"|"_s,
+                                                      posted ? amount(v.quotaAfter) + u'|' + amount(v.pagoAfter) : u"|"_s, v.reason);
+    }
+    return out;
 }
 
 }  // namespace
@@ -129,6 +146,19 @@ class ImportTest : public QObject, DatabaseFixture {
     QStringList snapshot()
     {
         return rows("SELECT * FROM tbQuotas_Movimentos ORDER BY 1") + rows("SELECT * FROM tbQuotas_Socios ORDER BY 1");
+    }
+    // A month with one case of each verdict of the dry run.
+    QString dryRunMonth()
+    {
+        charged(1, "101", 10.0);        // unpaid: posted
+        charged(2, "102", 12.0, 12.0);  // paid as deducted: left alone
+        charged(3, "103", 5.0, 5.0);    // paid, deduction above the charge: posted
+        member(4, "104");
+        movement(4, 1, 10.0, 0.0);
+        charged(5, "105", 10.0);
+        charged(6, "106", 10.0);
+        c().execute(QStringLiteral("INSERT INTO extras (Field0) VALUES ('antes')"));
+        return useImportFile("no_tap;quota\n101;8.00\n102;12.00\n103;7.50\n999;1.00\n104;9.00\n105;abc\n101;8.00\n106;0\n");
     }
     static ImportSummary run(int month = 3, int tipo = 1) { return ProcessarImportacao(month, 2004, tipo); }
     // General::ImportarQuotas returns at once, the dialog stays.
@@ -476,6 +506,52 @@ private slots:
                                                        {importar(march, file + "x"), "não existe"}};
         for (const auto& [refused, reason] : refusals)
             QVERIFY2(refused.status == 1 && refused.err.contains(reason), qPrintable(refused.err));
+    }
+
+    // The dry run: each verdict on a hand-made month, the import that follows
+    // agreeing line by line, and not a row of the database changed by it.
+    void dryRunTellsEachVerdictWritesNothingAndAgreesWithTheImport()
+    {
+        dryRunMonth();
+        const QStringList before = everything();
+        ScriptedBoxes boxes;
+        ImportVerdicts dry;
+        SimularImportacao(3, 2004, 1, dry);
+        QCOMPARE(described(dry), (QStringList{"1|101|registar|10.00|0.00|8.00|8.00|",
+                                              "2|102|deixar|12.00|12.00|||já registada",
+                                              "3|103|registar|5.00|5.00|7.50|7.50|",
+                                              "4|999|rejeitar|||||sem quota gerada",
+                                              "5|104|rejeitar|10.00|0.00|||sem conta",
+                                              "6|105|rejeitar|10.00|0.00|||valor ilegível",
+                                              "7|101|deixar|8.00|8.00|||já registada",
+                                              "8|106|deixar|10.00|0.00|||desconto de 0,00"}));
+        QCOMPARE(everything(), before);
+        QVERIFY(boxes.shown.isEmpty());
+        // The import that follows does line for line what the dry run said.
+        ImportVerdicts done;
+        const ImportSummary summary = ProcessarImportacao(3, 2004, 1, &done);
+        QCOMPARE(described(done), described(dry));
+        QCOMPARE(summary.posted, dry.count(ImportVerdict::Kind::Post));
+        QCOMPARE(rows(u"SELECT pago FROM tbQuotas_Movimentos ORDER BY socio_id"_s),
+                 (QStringList{"8", "12", "7.5", "0", "0", "0"}));
+    }
+
+    // stdout one line per line of the file, then the totals; the exit status the import would have.
+    void quotasImportarSimular()
+    {
+        const QString file = dryRunMonth();
+        const QStringList before = everything();
+        const CliRun r = quotas({u"importar"_s, u"--simular"_s, u"--ano"_s, u"2004"_s, u"--mes"_s, u"3"_s, u"--tipo"_s, u"1"_s, file});
+        QCOMPARE(r.status, 3);
+        const QStringList out = r.out.split(u'\n', Qt::SkipEmptyParts);
+        QCOMPARE(out.size(), 9);
+        QCOMPARE(out[0], u"1\t101\tregistar\t10,00\t0,00\t8,00\t8,00\t"_s);
+        QCOMPARE(out[5], u"6\t105\trejeitar\t10,00\t0,00\t\t\tvalor ilegível"_s);
+        QCOMPARE(out[8], u"A registar: 2 linha(s), 15,50 Esc; a deixar (já registadas): 3; a rejeitar: 3."_s);
+        QCOMPARE(everything(), before);
+        const CliRun clean = quotas({u"importar"_s, u"--simular"_s, u"--ano"_s, u"2004"_s, u"--mes"_s, u"3"_s, u"--tipo"_s, u"1"_s,
+                                     useImportFile("no_tap;quota\n101;8.00\n")});
+        QCOMPARE(clean.status, 0);
     }
 
     // Not modal, one at a time, on today's choices; the check box sets the

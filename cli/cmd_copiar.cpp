@@ -3,6 +3,7 @@
 #include "component/shared_objects.h"
 #include "platform/connection.h"
 #include "schema/copy_installation.h"
+#include "schema/schema.h"
 #include "settings/login.h"
 
 #include <QRegularExpression>
@@ -49,10 +50,14 @@ int copiar(const QStringList& args)
         const CopyVerification verification = copyInstallation(Data().SqlServer, target, [](const QString& line) {
             std::fputs((line + u'\n').toUtf8().constData(), stderr);
         });
+        // The copy's tables are made as init-db makes them, without the
+        // indexes the runs need at scale: init-db's index step follows.
+        const QString indexes = addIndexes(target).text();
         const QString command = QStringLiteral("quotas config --data-source %1 --catalog %2 --user %3 --password %4")
                                     .arg(shellWord(to.dataSource), shellWord(to.catalog), shellWord(to.user),
                                          shellWord(to.password));
-        std::fputs((verification.text() + QStringLiteral("\nCópia concluída e verificada. Para passar a usar o servidor:\n  ")
+        std::fputs((verification.text() + u'\n' + indexes
+                    + QStringLiteral("Cópia concluída e verificada. Para passar a usar o servidor:\n  ")
                     + command + u'\n')
                        .toUtf8()
                        .constData(),

@@ -34,14 +34,7 @@ int initDb(const QStringList& args)
     if (demo > 0)
         report += QStringLiteral("%1 associados de demonstração adicionados.\n").arg(addDemoMembers(connection, demo));
     // A separate step: the tables are there whatever it finds.
-    const IndexReport indexes = addIndexes(connection);
-    report += QStringLiteral("Índices presentes: %1.\n").arg(indexes.added.join(QStringLiteral(", ")));
-    if (!indexes.blocked.isEmpty())
-        report += indexes.blocked.join(u'\n')
-                  + QStringLiteral("\nOs processamentos funcionam sem estes índices únicos: cada um verifica o que "
-                                   "eles garantiriam, com o associado reservado. Nenhum registo foi alterado; depois "
-                                   "de corrigir os registos repetidos, volte a executar \"quotas init-db\" para os "
-                                   "criar.\n");
+    report += addIndexes(connection).text();
     std::fputs(report.toUtf8().constData(), stdout);
     return 0;
 }

@@ -98,7 +98,7 @@ const std::vector<Command>& commands()
             .run = copiar,
             .summary = "copia a instalação em uso para uma base de dados PostgreSQL vazia",
             .description = "Copia todas as tabelas da base de dados em uso para uma base de dados vazia num servidor "
-                           "PostgreSQL e verifica-as tabela a tabela. A configuração continua a apontar para onde "
+                           "PostgreSQL, verifica-as tabela a tabela e cria os índices, como \"quotas init-db\". A configuração continua a apontar para onde "
                            "apontava; no fim é mostrado o comando \"quotas config\" que passa a usar o servidor.",
             .options = {
                 {"data-source", "HOST[,PORTA]", "Servidor de destino, HOST ou HOST,PORTA.", true},

@@ -186,6 +186,18 @@ QStringList duplicateLines(Connection& connection, const IndexDef& index)
 
 }  // namespace
 
+QString IndexReport::text() const
+{
+    QString text = QStringLiteral("Índices presentes: %1.\n").arg(added.join(QStringLiteral(", ")));
+    if (!blocked.isEmpty())
+        text += blocked.join(u'\n')
+                + QStringLiteral("\nOs processamentos funcionam sem estes índices únicos: cada um verifica o que "
+                                 "eles garantiriam, com o associado reservado. Nenhum registo foi alterado; depois "
+                                 "de corrigir os registos repetidos, volte a executar \"quotas init-db\" para os "
+                                 "criar.\n");
+    return text;
+}
+
 IndexReport addIndexes(Connection& connection)
 {
     IndexReport report;

@@ -17,6 +17,10 @@ QStringList createSchema(Connection& connection);
 struct IndexReport {
     QStringList added;    // the indexes that exist now, by name
     QStringList blocked;  // the unique indexes the rows prevent, each followed by its repeated rows
+
+    // What the administrator reads: the indexes present and, when some
+    // unique ones were prevented, the rows that prevent them and what to do.
+    QString text() const;
 };
 
 // Adds to the dues tables the indexes that speed the runs up, and the unique

@@ -75,6 +75,10 @@ private slots:
                      qPrintable(name + ": " + out));
             QCOMPARE(table(target.connection(), name), table(source->connection(), name));
         }
+        // The runs' indexes, as init-db makes them.
+        QVERIFY2(out.contains("\nÍndices presentes: ux_tbquotas_socios_socio"), qPrintable(out));
+        QCOMPARE(rowsText(target.connection(), "SELECT COUNT(*) FROM pg_indexes WHERE indexname = 'ux_tbquotas_movimentos_due'"),
+                 QStringList{"1"});
         QVERIFY2(out.endsWith(QStringLiteral("quotas config --data-source %1 --catalog %2 --user %3 --password %4\n")
                                   .arg(target.dataSource(), target.catalog(), target.user(), target.password())),
                  qPrintable(out));
